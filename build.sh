@@ -1,0 +1,62 @@
+#!/usr/bin/env bash
+# Sets up, builds and runs qzscoring on a Debian 12 machine.
+#
+#   ./build.sh demo       install what the build needs, build, score the bundled example
+#   ./build.sh test       install what the build needs, build, run the whole test suite
+#   ./build.sh sanitize   the test suite under AddressSanitizer and UndefinedBehaviorSanitizer
+#
+# Installing packages needs root; as another user the script names the missing packages
+# and stops.
+set -euo pipefail
+cd "$(dirname "$0")"
+
+packages=(cmake make g++ pkg-config ccache libxerces-c-dev libgtest-dev libgmock-dev
+          libbenchmark-dev)
+jobs=$(nproc 2>/dev/null || echo 2)
+
+setup() {
+  local missing=()
+  for p in "${packages[@]}"; do
+    dpkg-query -W -f='${Status}' "$p" 2>/dev/null | grep -q "install ok installed" || missing+=("$p")
+  done
+  [ ${#missing[@]} -eq 0 ] && return 0
+  if [ "$(id -u)" -ne 0 ]; then
+    echo "missing packages: ${missing[*]} (install them as root: apt-get install ${missing[*]})" >&2
+    exit 1
+  fi
+  export DEBIAN_FRONTEND=noninteractive
+  apt-get update -qq
+  apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
+}
+
+# build DIR [cmake options...]
+build() {
+  local dir=$1; shift
+  local launcher=()
+  command -v ccache >/dev/null && launcher=(-DCMAKE_CXX_COMPILER_LAUNCHER=ccache)
+  cmake -S . -B "$dir" -DCMAKE_BUILD_TYPE=RelWithDebInfo "${launcher[@]}" "$@" >/dev/null
+  cmake --build "$dir" -j"$jobs"
+}
+
+case "${1:-}" in
+  demo)
+    setup
+    build build
+    build/bin/score_example examples/data/house_price.pmml examples/data/houses.csv
+    ;;
+  test)
+    setup
+    build build
+    ctest --test-dir build --output-on-failure -j"$jobs"
+    ;;
+  sanitize)
+    setup
+    flags="-fsanitize=address,undefined -fno-omit-frame-pointer -fno-sanitize-recover=undefined"
+    build build-asan -DCMAKE_BUILD_TYPE=Debug "-DCMAKE_CXX_FLAGS=$flags"
+    ASAN_OPTIONS=detect_leaks=1 ctest --test-dir build-asan --output-on-failure -j"$jobs"
+    ;;
+  *)
+    echo "usage: $0 demo|test|sanitize" >&2
+    exit 2
+    ;;
+esac

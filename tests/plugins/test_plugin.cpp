@@ -1,0 +1,84 @@
+// A scorer plug-in for the dispatch tests, built several times with a different
+// behaviour each (chosen by a compile definition):
+//   PLUGIN_STREAM       the stream attempt succeeds
+//   PLUGIN_DOM          the stream attempt consumes the stream and gives null; the
+//                       element attempt succeeds
+//   PLUGIN_NULL_PARSER  the entry point returns null
+//   PLUGIN_THROWS       both attempts throw
+//   PLUGIN_NO_ENTRY     no entry point at all
+// The scorer's type text tells the test which attempt made it and what it saw.
+
+#include <iterator>
+#include <stdexcept>
+#include <string>
+
+#include "ScoringScoreParser.h"
+#include "ScoringStr.h"
+#include "Value.h"
+#include "ValueRecord.h"
+
+using QZCommon_800::IQZScore;
+using QZCommon_800::QZStatus;
+using QZCommon_800::Value;
+using QZCommon_800::ValueRecord;
+
+namespace {
+
+class EchoScorer : public IQZScore {
+ public:
+  explicit EchoScorer(std::string type) : type_(std::move(type)) {}
+  bool IsReady() const override { return true; }
+  QZStatus Scorable(ValueRecord& record) override {
+    record.Add("prediction", Value());
+    return QZStatus();
+  }
+  QZStatus Score(const ValueRecord& input, ValueRecord& output) override {
+    output["prediction"] = input.Get("x").GetReal() * 2;
+    return QZStatus();
+  }
+  std::string GetType() const override { return type_; }
+
+ private:
+  std::string type_;
+};
+
+class TestParser : public QZScoring_800::ScoringScoreParser {
+ public:
+  IQZScore* CreateFromElement(QZXML_800::QZSettings&, QZXML_800::QZVarList&,
+                              xercesc::DOMDocument* document,
+                              xercesc::DOMElement* element) override {
+#if defined(PLUGIN_THROWS)
+    throw std::runtime_error("element");
+#endif
+    if (document == nullptr || element == nullptr) return nullptr;
+    QZScoring_800::ScoringStr name(element->getTagName());
+    return new EchoScorer("element:" + name.toUTF8());
+  }
+
+  IQZScore* CreateFromStream(QZXML_800::QZSettings&, QZXML_800::QZVarList& variables,
+                             std::istream& pmml) override {
+#if defined(PLUGIN_THROWS)
+    throw 42;
+#endif
+    std::string text((std::istreambuf_iterator<char>(pmml)), std::istreambuf_iterator<char>());
+#if defined(PLUGIN_DOM)
+    (void)variables;
+    return nullptr;
+#else
+    return new EchoScorer("stream:" + std::to_string(text.size()) + ":" +
+                          std::to_string(variables.Size()));
+#endif
+  }
+};
+
+}  // namespace
+
+#if !defined(PLUGIN_NO_ENTRY)
+QZSCORING_PLUGIN_EXPORT QZScoring_800::ScoringScoreParser* GetScoreParser() {
+#if defined(PLUGIN_NULL_PARSER)
+  return nullptr;
+#else
+  return new TestParser();
+#endif
+}
+#endif
