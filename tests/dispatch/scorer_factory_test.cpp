@@ -6,12 +6,12 @@
 #include <string>
 
 #include <gtest/gtest.h>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "QZSafeParser.h"
 #include "ScoringDynamicLoadedLibrary.h"
 #include "ScoringScorerFactory.h"
 #include "ValueRecord.h"
+#include "XercesTestEnvironment.h"
 
 using QZCommon_800::IQZScore;
 using QZScoring_800::QZScoringConst;
@@ -20,13 +20,6 @@ using QZXML_800::QZSettings;
 using QZXML_800::QZVarList;
 
 namespace {
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-const auto* const kXerces = ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 const char kTreeDocument[] =
     "<?xml version=\"1.0\"?>\n"

@@ -12,10 +12,10 @@
 #include <xercesc/dom/DOMDocument.hpp>
 #include <xercesc/dom/DOMElement.hpp>
 #include <xercesc/sax/SAXParseException.hpp>
-#include <xercesc/util/PlatformUtils.hpp>
 #include <xercesc/util/XMLException.hpp>
 
 #include "QZXInputSource.h"
+#include "XercesTestEnvironment.h"
 
 namespace {
 
@@ -23,14 +23,6 @@ using QZXML_800::QZSafeDOMParser;
 using QZXML_800::QZSafeSAX2Handler;
 using QZXML_800::QZXInputSource;
 using QZXML_800::TranscodeToUTF8;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 const char kBillionLaughs[] =
     "<?xml version=\"1.0\"?>\n<!DOCTYPE lolz [\n <!ENTITY lol \"lol\">\n"

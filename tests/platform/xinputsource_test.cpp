@@ -8,23 +8,15 @@
 #include <gtest/gtest.h>
 #include <xercesc/dom/DOMDocument.hpp>
 #include <xercesc/dom/DOMElement.hpp>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "QZSafeParser.h"
+#include "XercesTestEnvironment.h"
 
 namespace {
 
 using QZXML_800::QZSafeDOMParser;
 using QZXML_800::QZXInputSource;
 using QZXML_800::TranscodeToUTF8;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 std::string RootName(xercesc::DOMDocument* doc) {
   return doc == nullptr ? "<none>" : TranscodeToUTF8(doc->getDocumentElement()->getTagName());

@@ -6,18 +6,10 @@
 #include <cstdint>
 #include <string>
 
-#include <xercesc/util/PlatformUtils.hpp>
+#include "XercesTestEnvironment.h"
 
 namespace QZScoring_800 {
 namespace {
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { XERCES_CPP_NAMESPACE::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { XERCES_CPP_NAMESPACE::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const gXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 std::u16string Text(const ScoringStr& s) {
   return s.xc_str() != nullptr ? std::u16string(s.xc_str()) : u"<null>";

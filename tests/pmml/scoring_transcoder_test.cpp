@@ -5,18 +5,10 @@
 
 #include <string>
 
-#include <xercesc/util/PlatformUtils.hpp>
+#include "XercesTestEnvironment.h"
 
 namespace QZScoring_800 {
 namespace {
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { XERCES_CPP_NAMESPACE::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { XERCES_CPP_NAMESPACE::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const gXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 // The default, a null and an empty name all give UTF-8; null text converts to "".
 TEST(ScoringTranscoderTest, DefaultAndEmptyNamesMeanUtf8) {
