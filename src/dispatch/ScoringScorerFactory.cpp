@@ -10,6 +10,7 @@
 #include <xercesc/dom/DOMNodeList.hpp>
 #include <xercesc/util/XMLString.hpp>
 
+#include "ModelTypeNames.h"
 #include "QZSafeParser.h"
 #include "QZXInputSource.h"
 #include "ScoringDynamicLoadedLibrary.h"
@@ -103,27 +104,7 @@ QZStatus ScoringScorerFactory::GetModelNames(std::vector<std::string>& names,
 }
 
 QZScoringConst::ModelType ScoringScorerFactory::GetModelType(const std::string& elementName) {
-  static const std::pair<const char*, QZScoringConst::ModelType> kTypes[] = {
-      {"AssociationModel", QZScoringConst::MODEL_ASSOCIATION},
-      {"ClusteringModel", QZScoringConst::MODEL_CLUSTERING},
-      {"GeneralRegressionModel", QZScoringConst::MODEL_GENERAL_REGRESSION},
-      {"MiningModel", QZScoringConst::MODEL_MINING},
-      {"NaiveBayesModel", QZScoringConst::MODEL_NAIVE_BAYES},
-      {"NeuralNetwork", QZScoringConst::MODEL_NEURAL_NETWORK},
-      {"RegressionModel", QZScoringConst::MODEL_REGRESSION},
-      {"RuleSetModel", QZScoringConst::MODEL_RULE_SET},
-      {"SequenceModel", QZScoringConst::MODEL_SEQUENCE},
-      {"SupportVectorMachineModel", QZScoringConst::MODEL_SUPPORT_VECTOR_MACHINE},
-      {"TextModel", QZScoringConst::MODEL_TEXT},
-      {"TimeSeriesModel", QZScoringConst::MODEL_TIME_SERIES},
-      {"TreeModel", QZScoringConst::MODEL_TREE},
-      {"BayesNetModel", QZScoringConst::MODEL_BAYES_NET},
-      {"NearestNeighborModel", QZScoringConst::MODEL_NEAREST_NEIGHBOR},
-  };
-  for (const auto& type : kTypes) {
-    if (elementName == type.first) return type.second;
-  }
-  return QZScoringConst::MODEL_UNKNOWN;
+  return ModelTypeOfElement(elementName);
 }
 
 IQZScore* ScoringScorerFactory::GetScorer(QZSettings& settings, QZVarList& variables,

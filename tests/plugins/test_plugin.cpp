@@ -6,6 +6,9 @@
 //   PLUGIN_NULL_PARSER  the entry point returns null
 //   PLUGIN_THROWS       both attempts throw
 //   PLUGIN_NO_ENTRY     no entry point at all
+//   PLUGIN_SETTINGS     the stream attempt gives a scorer whose "prediction" and
+//                       "probability" are the model settings "test_prediction" and
+//                       "test_probability" at the time of each Score
 // The scorer's type text tells the test which attempt made it and what it saw.
 
 #include <iterator>
@@ -42,6 +45,29 @@ class EchoScorer : public IQZScore {
   std::string type_;
 };
 
+class SettingsScorer : public IQZScore {
+ public:
+  explicit SettingsScorer(QZXML_800::QZSettings& settings) : settings_(settings) {}
+  bool IsReady() const override { return true; }
+  QZStatus Scorable(ValueRecord& record) override {
+    record.Add("prediction", Value());
+    record.Add("probability", Value());
+    return QZStatus();
+  }
+  QZStatus Score(const ValueRecord&, ValueRecord& output) override {
+    std::string prediction, probability;
+    if (!settings_.GetSettingValByName("test_prediction", prediction)) return QZStatus(77, false);
+    settings_.GetSettingValByName("test_probability", probability);
+    output["prediction"] = prediction;
+    output["probability"] = Value(probability).GetReal();
+    return QZStatus();
+  }
+  std::string GetType() const override { return "SETTINGS"; }
+
+ private:
+  QZXML_800::QZSettings& settings_;
+};
+
 class TestParser : public QZScoring_800::ScoringScoreParser {
  public:
   IQZScore* CreateFromElement(QZXML_800::QZSettings&, QZXML_800::QZVarList&,
@@ -55,8 +81,12 @@ class TestParser : public QZScoring_800::ScoringScoreParser {
     return new EchoScorer("element:" + name.toUTF8());
   }
 
-  IQZScore* CreateFromStream(QZXML_800::QZSettings&, QZXML_800::QZVarList& variables,
+  IQZScore* CreateFromStream(QZXML_800::QZSettings& settings, QZXML_800::QZVarList& variables,
                              std::istream& pmml) override {
+#if defined(PLUGIN_SETTINGS)
+    return new SettingsScorer(settings);
+#endif
+    (void)settings;
 #if defined(PLUGIN_THROWS)
     throw 42;
 #endif

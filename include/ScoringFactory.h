@@ -1,0 +1,66 @@
+// The entry point of a host: turns PMML documents into scoring models.
+#ifndef QZSCORING_SCORING_FACTORY_H_
+#define QZSCORING_SCORING_FACTORY_H_
+
+#include <istream>
+#include <memory>
+#include <string>
+
+#include "QZScoringExport.h"
+#include "QZSettings.h"
+#include "QZStatus.h"
+
+namespace QZScoring_800 {
+
+class ScoringModel;
+
+// A factory initialises Xerces-C++ for its lifetime and holds the last model it built
+// until the host takes it with Detach; the factory deletes a model it still holds when
+// it is destroyed or when Attach replaces it. Every operation reports failure through
+// its result (null) and GetStatus; none throws. One thread uses a factory at a time;
+// several factories may live in several threads.
+class QZSCORING_API ScoringFactory {
+ public:
+  // Initialises Xerces-C++; when that fails GetStatus reports 103.
+  ScoringFactory();
+  ~ScoringFactory();
+  // A held model has one owner: factories are not copied.
+  ScoringFactory(const ScoringFactory&) = delete;
+  ScoringFactory& operator=(const ScoringFactory&) = delete;
+
+  // Creates a model from the PMML document in the file, as the stream form does.
+  // 260004 when the file cannot be opened.
+  ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings, const std::string& fileName);
+
+  // Creates a model from one PMML (or time-series XML) document. settings holds the
+  // plug-in registry ("scoringDll", "modelDll") and receives "scoring_version",
+  // "scoring_modelType" and "scoring_multipleModelMethod" of the document. The model is
+  // returned and held by the factory (see Detach); null on failure with the reason in
+  // GetStatus: 260002 a model is already held (it stays held), 260005/260006 registry
+  // settings missing, 260007 the document could not be scanned, 260010 no scorer,
+  // 104 to 111 the data dictionary could not be read.
+  ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings, std::istream& pmml);
+
+  // Deletes the held model, if any, and holds model instead (ownership passes to the
+  // factory; null holds none).
+  void Attach(ScoringModel* model);
+
+  // Hands the held model to the caller (null when none) and resets the status to OK.
+  ScoringModel* Detach();
+
+  // The outcome of the last operation.
+  QZCommon_800::QZStatus GetStatus() const;
+
+ private:
+  QZCommon_800::QZStatus InitXerces();
+  void TermXerces();
+  ScoringModel* CreateFromStream(QZXML_800::QZSettings& settings, std::istream& pmml);
+
+  QZCommon_800::QZStatus status_;
+  std::unique_ptr<ScoringModel> model_;
+  bool xercesInitialised_ = false;
+};
+
+}  // namespace QZScoring_800
+
+#endif  // QZSCORING_SCORING_FACTORY_H_
