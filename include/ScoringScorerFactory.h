@@ -26,6 +26,7 @@ class QZTransformation;
 namespace QZScoring_800 {
 
 class ScoringModelAttr;
+class ScoringPredicate;
 
 // All operations are static and keep no state; they work only on what they are given
 // and may run on any thread. The registry lives in the caller's settings:
@@ -105,6 +106,13 @@ class QZSCORING_API ScoringScorerFactory {
   // A new transformation engine loaded with the skeleton's transformations, owned by
   // the caller; null for a null record or when the engine refuses them.
   static QZTransformNS_8_0_0::QZTransformation* GetTransformation(ScoringModelAttr*& record);
+
+  // Builds a predicate from a stand-alone predicate document (root CompoundPredicate,
+  // SimplePredicate, SimpleSetPredicate, True or False) over the fields of variables,
+  // reading texts with the settings' "encoding". A new predicate owned by the caller, or
+  // null for any failure; never throws.
+  static ScoringPredicate* GetPredicate(QZXML_800::QZSettings& settings,
+                                        QZXML_800::QZVarList& variables, std::istream& pmml);
 };
 
 }  // namespace QZScoring_800
