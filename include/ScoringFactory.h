@@ -4,7 +4,9 @@
 
 #include <istream>
 #include <memory>
+#include <sstream>
 #include <string>
+#include <vector>
 
 #include "QZScoringExport.h"
 #include "QZSettings.h"
@@ -40,6 +42,25 @@ class QZSCORING_API ScoringFactory {
   // settings missing, 260007 the document could not be scanned, 260010 no scorer,
   // 104 to 111 the data dictionary could not be read.
   ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings, std::istream& pmml);
+
+  // Creates a model from the files listed in "scoring_pmmlFiles": one file gives the
+  // file form; several give a multi model whose sub-models are named by
+  // "scoring_modelIDs" (one ID per file; the shorter list ends the loop). 260003 when the
+  // one file name is empty, or several files come without "scoring_modelIDs"; a failing
+  // document fails the whole model with its own code.
+  ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings);
+
+  // Creates a model from documents in memory: with nested settings "scoring_splitModel"
+  // a split model (sub-model i from stream i, keyed by its split model ID's values),
+  // else with "scoring_modelIDs" a multi model, else the stream form of the single
+  // stream (260028 for any other number of streams). The streams stay the caller's.
+  ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings,
+                                   const std::vector<std::stringstream*>& streams);
+
+  // The setting name as a list of texts: a list of strings, or the texts of a
+  // QZVecValue<std::string>; empty when absent or of another kind.
+  static std::vector<std::string> GetVecStringValue(const QZXML_800::QZSettings& settings,
+                                                    const std::string& name);
 
   // Deletes the held model, if any, and holds model instead (ownership passes to the
   // factory; null holds none).
