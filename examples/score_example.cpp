@@ -1,6 +1,6 @@
 // An example host: scores the records of a CSV file (a header row, then numbers) with a
-// PMML regression model through the plug-in registry, and prints one prediction per
-// record.
+// PMML regression model created by the scoring factory, whose registry sends the model
+// to the example plug-in, and prints one prediction per record.
 //
 //   score_example MODEL.pmml RECORDS.csv
 
@@ -11,11 +11,8 @@
 #include <string>
 #include <vector>
 
-#include <xercesc/util/PlatformUtils.hpp>
-
-#include "QZSafeParser.h"
-#include "ScoringScorerFactory.h"
-#include "ScoringStr.h"
+#include "ScoringFactory.h"
+#include "ScoringModel.h"
 #include "ValueRecord.h"
 
 using namespace QZScoring_800;
@@ -42,33 +39,18 @@ QZXML_800::QZSettings MakeRegistry() {
 }
 
 int Run(const char* modelFile, const char* csvFile) {
-  std::ifstream pmml(modelFile, std::ios::binary);
   std::ifstream csv(csvFile);
-  if (!pmml || !csv) {
-    std::cerr << "cannot open " << (!pmml ? modelFile : csvFile) << "\n";
+  if (!csv) {
+    std::cerr << "cannot open " << csvFile << "\n";
     return 2;
   }
   QZXML_800::QZSettings settings = MakeRegistry();
-
-  // Tell the dispatcher which model and PMML version the document holds.
-  std::vector<std::string> modelNames;
-  ScoringScorerFactory::GetModelNames(modelNames, settings);
-  QZXML_800::QZSafeDOMParser parser;
-  xercesc::DOMDocument* document = nullptr;
-  xercesc::DOMElement* model = nullptr;
-  if (ScoringScorerFactory::GetDOMDocument(modelNames, pmml, &parser, document, model).IsError()) {
-    std::cerr << modelFile << ": no RegressionModel in a PMML document\n";
-    return 1;
-  }
-  ScoringStr version(document->getDocumentElement()->getAttribute(u"version"));
-  settings.AddSetting("scoring_version", version.toUTF8(), true);
-  settings.AddSetting("scoring_modelType", ScoringStr(model->getTagName()).toUTF8(), true);
-
-  QZXML_800::QZVarList variables;
-  std::unique_ptr<QZCommon_800::IQZScore> scorer(
-      ScoringScorerFactory::GetScorer(settings, variables, pmml));
-  if (!scorer) {
-    std::cerr << modelFile << ": no plug-in could score this model\n";
+  ScoringFactory factory;
+  std::unique_ptr<ScoringModel> model(factory.CreateScoringModel(settings, modelFile));
+  factory.Detach();  // the model is ours from here on
+  if (!model) {
+    std::cerr << modelFile << ": no model (status " << factory.GetStatus().GetErrorCode()
+              << ")\n";
     return 1;
   }
 
@@ -77,7 +59,7 @@ int Run(const char* modelFile, const char* csvFile) {
   const std::vector<std::string> header = SplitCsvLine(line);
   QZCommon_800::ValueRecord input, output;
   for (const std::string& name : header) input.Add(name, QZCommon_800::Value());
-  scorer->Scorable(output);
+  model->Scorable(output);
 
   std::cout << line << ",prediction\n";
   while (std::getline(csv, line)) {
@@ -86,7 +68,7 @@ int Run(const char* modelFile, const char* csvFile) {
       input[i] = i < cells.size() ? QZCommon_800::Value(QZCommon_800::Value(cells[i]).GetReal())
                                   : QZCommon_800::Value();
     }
-    const QZCommon_800::QZStatus status = scorer->Score(input, output);
+    const QZCommon_800::QZStatus status = model->Score(input, output);
     std::cout << line << ","
               << (status.IsOK() ? output.Get("prediction").GetString() : "error") << "\n";
   }
@@ -100,13 +82,5 @@ int main(int argc, char** argv) {
     std::cerr << "usage: score_example MODEL.pmml RECORDS.csv\n";
     return 2;
   }
-  try {
-    xercesc::XMLPlatformUtils::Initialize();
-  } catch (...) {
-    std::cerr << "cannot initialise the XML parser\n";
-    return 1;
-  }
-  int rc = Run(argv[1], argv[2]);
-  xercesc::XMLPlatformUtils::Terminate();
-  return rc;
+  return Run(argv[1], argv[2]);
 }
