@@ -1,16 +1,34 @@
 // ValueRecord: named fields with a copy-on-write layout shared between copies.
 #include "ValueRecord.h"
 
+#include <atomic>
 #include <unordered_map>
 #include <utility>
 
 namespace QZCommon_800 {
 
+namespace {
+
+// Identities of layouts: never reused within a process (0 means "no layout").
+uint64_t NextLayoutId() noexcept {
+  static std::atomic<uint64_t> counter{0};
+  return counter.fetch_add(1, std::memory_order_relaxed) + 1;
+}
+
+}  // namespace
+
 // The field names in order and their positions. Never changed while shared: a record
-// that adds a field to a shared layout copies it first.
+// that adds a field to a shared layout copies it first. Names are only ever appended,
+// so one layout's names up to a given size never change; a copy gets an identity of
+// its own because it will grow differently.
 struct ValueRecord::Layout {
+  Layout() : id(NextLayoutId()) {}
+  Layout(const Layout& other) : names(other.names), index(other.index), id(NextLayoutId()) {}
+  Layout& operator=(const Layout&) = delete;
+
   std::vector<std::string> names;
   std::unordered_map<std::string, size_t> index;
+  uint64_t id;
 };
 
 ValueRecord::ValueRecord(size_t capacity) {
@@ -133,6 +151,8 @@ std::vector<std::string> ValueRecord::Names(bool all) const {
   }
   return names;
 }
+
+uint64_t ValueRecord::GetLayoutId() const noexcept { return layout_ ? layout_->id : 0; }
 
 void ValueRecord::ClearValues() noexcept {
   for (Value& value : values_) value = Value();

@@ -3,6 +3,7 @@
 #define QZ_PLATFORM_VALUERECORD_H_
 
 #include <cstddef>
+#include <cstdint>
 #include <memory>
 #include <string>
 #include <vector>
@@ -63,6 +64,12 @@ class QZCOMMON_API ValueRecord {
   std::vector<std::string> Names(bool all = true) const;
   // Every value becomes null; names, order and storage are kept (no reallocation).
   void ClearValues() noexcept;
+  // A cheap identity of the field names: two records (or one record at two moments)
+  // with the same layout id and the same Size have the same names at every position.
+  // Copies share the id until one of them adds a field; ids are never reused. 0 for a
+  // record that never had a field. Lets a caller that cached field positions check a
+  // record's layout with two comparisons instead of name lookups.
+  uint64_t GetLayoutId() const noexcept;
 
  private:
   struct Layout;

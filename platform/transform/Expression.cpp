@@ -54,6 +54,10 @@ bool ParseDataType(const std::string& name, DataType* type) {
   return true;
 }
 
+bool IsNumericType(DataType type) {
+  return type == DataType::kInteger || type == DataType::kFloat || type == DataType::kDouble;
+}
+
 ValueKind KindOf(DataType type) {
   switch (type) {
     case DataType::kString:
@@ -137,6 +141,46 @@ bool MakeConstant(const std::string& text, DataType type, Value* out, std::strin
     *out = Value(text);  // date and time texts are kept as they are written
   }
   return true;
+}
+
+double Expr::EvalReal(const EvalContext& ctx) const {
+  Value scratch;
+  const Value* v = EvalRef(ctx, scratch);
+  return v != nullptr ? v->GetReal() : InvalidReal();
+}
+
+int ToBool(const Value& value) {
+  if (value.IsNumericValue()) {
+    if (value.IsSystemMissingValue()) return -1;
+    return value.GetReal() != 0.0 ? 1 : 0;
+  }
+  if (!value.IsString()) return -1;
+  const int b = BooleanOf(value.GetText());
+  if (b >= 0) return b;
+  const double d = Value::TextToReal(value.GetText());
+  if (IsMissingReal(d)) return -1;
+  return d != 0.0 ? 1 : 0;
+}
+
+bool ValuesEqual(const Value& a, const Value& b) {
+  if (a.IsNumericValue() && b.IsNumericValue()) return a.GetReal() == b.GetReal();
+  if (a.IsString() && b.IsString()) return a.GetText() == b.GetText();
+  if (a.IsMissing() || b.IsMissing()) return false;
+  const double x = a.GetReal();
+  const double y = b.GetReal();
+  return !IsMissingReal(x) && !IsMissingReal(y) && x == y;
+}
+
+int CompareValues(const Value& a, const Value& b) {
+  if (a.IsMissing() || b.IsMissing()) return 2;
+  if (a.IsString() && b.IsString()) {
+    const int c = a.GetText().compare(b.GetText());
+    return c < 0 ? -1 : (c > 0 ? 1 : 0);
+  }
+  const double x = a.GetReal();
+  const double y = b.GetReal();
+  if (IsMissingReal(x) || IsMissingReal(y)) return 2;
+  return x < y ? -1 : (x > y ? 1 : 0);
 }
 
 }  // namespace internal

@@ -20,13 +20,15 @@ struct LoadError {
 // The element's name without a namespace prefix, as UTF-8.
 std::string ElementName(const xercesc::DOMElement& element);
 
-// Records the DataField names of a DataDictionary element as the program's data fields.
+// Records the DataFields of a DataDictionary element (names, dataTypes, valid, invalid
+// and missing values, intervals) as the program's data fields.
 void ReadDataDictionary(const xercesc::DOMElement& dataDictionary, Program& program);
 
-// Compiles every DerivedField of a TransformationDictionary or LocalTransformations
-// element into the program, then checks field references (against the program's data
-// fields, when it knows them, and its derived fields) and computes the evaluation
-// order. Throws LoadError; the program is then half-built and must be dropped.
+// Compiles every DefineFunction and DerivedField of a TransformationDictionary or
+// LocalTransformations element into the program, then checks field references (against
+// the program's data fields, when it knows them, and its derived fields), calls between
+// functions, nesting depths, and computes the evaluation order. Throws LoadError; the
+// program is then half-built and must be dropped.
 void CompileTransformations(const xercesc::DOMElement& root, Program& program);
 
 }  // namespace internal

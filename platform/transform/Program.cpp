@@ -19,9 +19,27 @@ int Program::FindSlot(const std::string& name) const {
 }
 
 bool Program::AddField(std::shared_ptr<const DerivedField> field) {
-  if (!derived_.insert(field->name).second) return false;
+  // A load that fails part-way drops its whole copy of the program, so nothing here
+  // needs undoing on failure.
+  if (derived_.count(field->name) != 0) return false;
   fields_.push_back(std::move(field));
+  derived_.emplace(fields_.back()->name, fields_.size() - 1);
   return true;
+}
+
+DataType Program::DerivedType(const std::string& name) const {
+  const auto found = derived_.find(name);
+  return found == derived_.end() ? DataType::kNone : fields_[found->second]->dataType;
+}
+
+bool Program::AddFunction(std::shared_ptr<Function> function) {
+  const std::string name = function->name;
+  return functions_.emplace(name, std::move(function)).second;
+}
+
+const Function* Program::FindFunction(const std::string& name) const {
+  const auto found = functions_.find(name);
+  return found == functions_.end() ? nullptr : found->second.get();
 }
 
 bool Program::ComputeOrder(std::vector<std::string>* cycle) {
@@ -72,18 +90,6 @@ bool Program::ComputeOrder(std::vector<std::string>* cycle) {
   return true;
 }
 
-bool Binding::Matches(const Program& program, const ValueRecord& record) const {
-  if (!bound_ || record.Size() != size_) return false;
-  const std::vector<std::string>& names = program.SlotNames();
-  for (int slot : present_) {
-    if (record.GetName(static_cast<size_t>(index_[slot])) != names[slot]) return false;
-  }
-  for (int slot : absent_) {
-    if (record.Contains(names[slot])) return false;
-  }
-  return true;
-}
-
 void Binding::Bind(const Program& program, ValueRecord& record) {
   bound_ = false;
   for (const auto& field : program.Fields()) {
@@ -91,28 +97,56 @@ void Binding::Bind(const Program& program, ValueRecord& record) {
   }
   const std::vector<std::string>& names = program.SlotNames();
   index_.assign(names.size(), -1);
-  present_.clear();
-  absent_.clear();
-  for (size_t slot = 0; slot < names.size(); ++slot) {
-    index_[slot] = record.IndexOf(names[slot]);
-    (index_[slot] >= 0 ? present_ : absent_).push_back(static_cast<int>(slot));
-  }
+  for (size_t slot = 0; slot < names.size(); ++slot) index_[slot] = record.IndexOf(names[slot]);
+  layoutId_ = record.GetLayoutId();
   size_ = record.Size();
   bound_ = true;
 }
 
-void Run(const Program& program, Binding& binding, ValueRecord& record) {
-  if (!binding.Matches(program, record)) binding.Bind(program, record);
-  const EvalContext ctx{&record, binding.Index()};
+namespace {
+
+// A missing value of the field's kind: system-missing for numbers, else null.
+void SetMissing(const DerivedField& field, Value& value) {
+  const bool real = field.numeric || field.kind == ValueKind::kReal ||
+                    field.kind == ValueKind::kBoolean;
+  value = real ? Value(kMissing) : Value();
+}
+
+}  // namespace
+
+bool Run(const Program& program, Binding& binding, ValueRecord& record, std::string* error) {
+  if (!binding.Matches(record)) binding.Bind(program, record);
+  EvalContext ctx;
+  ctx.record = &record;
+  ctx.index = binding.Index();
   const auto& fields = program.Fields();
-  for (size_t f : program.Order()) {
-    const DerivedField& field = *fields[f];
+  const std::vector<size_t>& order = program.Order();
+  for (size_t k = 0; k < order.size(); ++k) {
+    const DerivedField& field = *fields[order[k]];
     // Bound, so the position exists; no expression reads its own field (that would be
     // a cycle, refused at load), so writing in place aliases nothing.
     Value& target = record[static_cast<size_t>(ctx.index[field.slot])];
-    field.expr->Eval(ctx, target);
-    CoerceToKind(field.kind, target);
+    bool valid;
+    if (field.numeric) {
+      const double d = field.expr->EvalReal(ctx);
+      valid = !IsInvalidReal(d);
+      if (valid) target = d;
+    } else {
+      valid = field.expr->Eval(ctx, target);
+      if (valid) CoerceToKind(field.kind, target);
+    }
+    if (!valid) {
+      const std::string where =
+          ctx.invalidAt != nullptr ? ctx.invalidAt->Describe() : std::string("its expression");
+      *error = "DerivedField '" + field.name + "': " + where + " gave an invalid result";
+      for (size_t rest = k; rest < order.size(); ++rest) {
+        const DerivedField& f = *fields[order[rest]];
+        SetMissing(f, record[static_cast<size_t>(ctx.index[f.slot])]);
+      }
+      return false;
+    }
   }
+  return true;
 }
 
 }  // namespace internal

@@ -1,18 +1,25 @@
-// A loaded set of derived fields, their evaluation order, and the binding of their names
-// to the positions of a record layout.
+// A loaded set of derived fields and user-defined functions, their evaluation order, and
+// the binding of their names to the positions of a record layout.
 #ifndef QZ_PLATFORM_TRANSFORM_PROGRAM_H_
 #define QZ_PLATFORM_TRANSFORM_PROGRAM_H_
 
+#include <cstdint>
 #include <memory>
 #include <string>
 #include <unordered_map>
-#include <unordered_set>
+#include <utility>
 #include <vector>
 
 #include "Expression.h"
+#include "Functions.h"
 
 namespace QZTransformNS_8_0_0 {
 namespace internal {
+
+// Deepest nesting of expressions accepted, counted through calls of user-defined
+// functions: evaluation recurses once per level, so this bounds the stack it needs
+// (a few hundred bytes a level) far below any thread's stack.
+constexpr int kMaxExpressionDepth = 250;
 
 // A field an expression reads, and the element that reads it (for messages).
 struct FieldUse {
@@ -20,7 +27,7 @@ struct FieldUse {
   std::string element;
 };
 
-// One compiled DerivedField. Immutable once compiled.
+// One compiled DerivedField. Immutable once its load has succeeded.
 struct DerivedField {
   std::string name;
   DataType dataType = DataType::kNone;
@@ -28,12 +35,21 @@ struct DerivedField {
   std::string optype;  // as written; empty when absent
   int slot = -1;       // the slot of its own name
   ExprPtr expr;
+  bool numeric = false;  // computed through EvalReal (the result is a number)
   std::vector<FieldUse> uses;  // every field the expression reads
+  std::vector<std::pair<const Function*, int>> calls;  // user functions, at their depth
+  int ownDepth = 0;
 };
 
-// Everything one engine has loaded. Copies are cheap (compiled fields are shared and
-// immutable), so a load works on a copy and replaces the engine's program only when it
-// succeeds.
+// What a loaded document declares about one of its input fields (a DataField).
+struct DataFieldInfo {
+  DataType dataType = DataType::kNone;
+  std::shared_ptr<const FieldValidity> validity;
+};
+
+// Everything one engine has loaded. Copies are cheap (compiled fields and functions are
+// shared and immutable), so a load works on a copy and replaces the engine's program
+// only when it succeeds.
 class Program {
  public:
   // The slot of a name (every name a derived field writes or an expression reads);
@@ -46,7 +62,15 @@ class Program {
   // Appends a compiled field; false (nothing added) when a field of that name exists.
   bool AddField(std::shared_ptr<const DerivedField> field);
   bool IsDerived(const std::string& name) const { return derived_.count(name) != 0; }
+  // The dataType of a loaded derived field; kNone when there is none of that name.
+  DataType DerivedType(const std::string& name) const;
   const std::vector<std::shared_ptr<const DerivedField>>& Fields() const { return fields_; }
+
+  // Adds a user-defined function (its body may still be compiled afterwards, during the
+  // same load); false when one of that name exists.
+  bool AddFunction(std::shared_ptr<Function> function);
+  // The function of that name, or null.
+  const Function* FindFunction(const std::string& name) const;
 
   // Computes the evaluation order (each field after the fields it reads, otherwise in
   // document order). False, with the fields of one cycle in *cycle, when fields depend
@@ -54,26 +78,29 @@ class Program {
   bool ComputeOrder(std::vector<std::string>* cycle);
   const std::vector<size_t>& Order() const { return order_; }
 
-  // Names of the input fields the loaded documents declare (their DataDictionary).
+  // The input fields the loaded documents declare (their DataDictionary).
   // knowsDataFields: at least one loaded document had a DataDictionary.
-  std::unordered_set<std::string> dataFields;
+  std::unordered_map<std::string, DataFieldInfo> dataFields;
   bool knowsDataFields = false;
 
  private:
   std::vector<std::string> slotNames_;
   std::unordered_map<std::string, int> slots_;
   std::vector<std::shared_ptr<const DerivedField>> fields_;  // document order
-  std::unordered_set<std::string> derived_;
+  std::unordered_map<std::string, size_t> derived_;          // name -> index in fields_
+  std::unordered_map<std::string, std::shared_ptr<const Function>> functions_;
   std::vector<size_t> order_;  // indices into fields_
 };
 
-// Record positions of a program's slots for one record layout. Binding looks names up;
-// checking that a record still has the bound layout compares the names at the bound
-// positions and so needs no lookup (except for names the record lacked).
+// Record positions of a program's slots for one record layout. Binding looks names up
+// once; checking that a later record has the same layout compares the record's layout
+// identity and size.
 class Binding {
  public:
   // True when the record has the layout bound last.
-  bool Matches(const Program& program, const ValueRecord& record) const;
+  bool Matches(const ValueRecord& record) const {
+    return bound_ && record.GetLayoutId() == layoutId_ && record.Size() == size_;
+  }
   // Appends the derived fields the record lacks (null, in document order) and binds
   // every slot to its position.
   void Bind(const Program& program, ValueRecord& record);
@@ -82,14 +109,16 @@ class Binding {
 
  private:
   bool bound_ = false;
+  uint64_t layoutId_ = 0;
   size_t size_ = 0;
-  std::vector<int> index_;   // per slot: record position or -1
-  std::vector<int> present_; // slots bound to a position
-  std::vector<int> absent_;  // slots the record lacks
+  std::vector<int> index_;  // per slot: record position or -1
 };
 
 // Computes every derived field of the program into the record, in dependency order.
-void Run(const Program& program, Binding& binding, ValueRecord& record);
+// False when a field's result is invalid (an Apply that returns invalid results): that
+// field and the ones after it in the order are set to missing, and *error names the
+// field and the function.
+bool Run(const Program& program, Binding& binding, ValueRecord& record, std::string* error);
 
 }  // namespace internal
 }  // namespace QZTransformNS_8_0_0

@@ -66,37 +66,47 @@ class QZTransformation::Impl {
     const xc::DOMDocument* document = QZXML_800::QZSafeDOMParser::ParseSafely(parser, in, &error);
     const char* what = source == Source::kPMML ? "PMML document" : "transformation dictionary";
     if (document == nullptr) {
-      throw LoadError{TRANSFORM_PARSE_FAILED, std::string("cannot parse the ") + what + ": " + error};
+      throw LoadError{TRANSFORM_PARSE_FAILED,
+                      std::string("cannot parse the ") + what + ": " + error};
     }
+    if (source == Source::kDictionary) return LoadElement(document->getDocumentElement());
     const xc::DOMElement& root = *document->getDocumentElement();
     const std::string rootName = internal::ElementName(root);
 
     Program next = keepExisting ? program_ : Program();
     const xc::DOMElement* transformations = nullptr;
-    if (source == Source::kPMML) {
-      if (rootName != "PMML") {
-        throw LoadError{TRANSFORM_PARSE_FAILED,
-                        "the document's root element is '" + rootName + "', not 'PMML'"};
+    if (rootName != "PMML") {
+      throw LoadError{TRANSFORM_PARSE_FAILED,
+                      "the document's root element is '" + rootName + "', not 'PMML'"};
+    }
+    for (const xc::DOMElement* c = root.getFirstElementChild(); c != nullptr;
+         c = c->getNextElementSibling()) {
+      const std::string name = internal::ElementName(*c);
+      if (name == "DataDictionary") {
+        internal::ReadDataDictionary(*c, next);
+      } else if (name == "TransformationDictionary" && transformations == nullptr) {
+        transformations = c;
       }
-      for (const xc::DOMElement* c = root.getFirstElementChild(); c != nullptr;
-           c = c->getNextElementSibling()) {
-        const std::string name = internal::ElementName(*c);
-        if (name == "DataDictionary") {
-          internal::ReadDataDictionary(*c, next);
-        } else if (name == "TransformationDictionary" && transformations == nullptr) {
-          transformations = c;
-        }
-      }
-    } else {
-      if (rootName != "TransformationDictionary" && rootName != "LocalTransformations") {
-        throw LoadError{TRANSFORM_PARSE_FAILED,
-                        "the dictionary's root element is '" + rootName +
-                            "', not 'TransformationDictionary' or 'LocalTransformations'"};
-      }
-      transformations = &root;
     }
     if (transformations != nullptr) internal::CompileTransformations(*transformations, next);
 
+    program_ = std::move(next);
+    binding_.Reset();
+    return QZStatus();
+  }
+
+  // Compiles a TransformationDictionary or LocalTransformations element, adding to
+  // what is loaded.
+  QZStatus LoadElement(const xc::DOMElement* root) {
+    if (root == nullptr) throw LoadError{TRANSFORM_PARSE_FAILED, "no dictionary element given"};
+    const std::string rootName = internal::ElementName(*root);
+    if (rootName != "TransformationDictionary" && rootName != "LocalTransformations") {
+      throw LoadError{TRANSFORM_PARSE_FAILED,
+                      "the dictionary's root element is '" + rootName +
+                          "', not 'TransformationDictionary' or 'LocalTransformations'"};
+    }
+    Program next = program_;
+    internal::CompileTransformations(*root, next);
     program_ = std::move(next);
     binding_.Reset();
     return QZStatus();
@@ -120,9 +130,16 @@ QZStatus QZTransformation::AddTransformationDictionary(std::istream& dictionary)
       [&] { return impl_->Load(dictionary, Impl::Source::kDictionary, true); });
 }
 
+QZStatus QZTransformation::AddTransformationDictionary(const xc::DOMElement* dictionary) {
+  return impl_->Guarded([&] { return impl_->LoadElement(dictionary); });
+}
+
 QZStatus QZTransformation::Transform(ValueRecord& record) {
   return impl_->Guarded([&] {
-    internal::Run(impl_->program_, impl_->binding_, record);
+    std::string error;
+    if (!internal::Run(impl_->program_, impl_->binding_, record, &error)) {
+      return impl_->Fail(TRANSFORM_INVALID_RESULT, error.c_str());
+    }
     return QZStatus();
   });
 }

@@ -1,5 +1,6 @@
-// The transformation engine: loading DerivedFields of FieldRef and Constant, computing
-// them in dependency order, typing, missing values, and every refusal at load.
+// The transformation engine's frame: loading documents and dictionaries, computing
+// derived fields (here of FieldRef and Constant) in dependency order, typing, missing
+// values, refusals at load, and the binding of record layouts.
 #include "QZTransformation.h"
 
 #include <sstream>
@@ -177,11 +178,11 @@ TEST(QZTransformation, RefusalsAtLoad) {
       {Pmml(Ref("a", "double", "b") + Ref("b", "double", "a")), 270005,
        "DerivedFields 'a' -> 'b' -> 'a' depend on each other in a cycle"},
       {Pmml(Ref("a", "double", "a")), 270005, "DerivedField 'a' refers to itself"},
-      {Pmml("<DerivedField name=\"ratio\" dataType=\"double\"><Apply function=\"/\">"
-            "<FieldRef field=\"x\"/><Constant>2</Constant></Apply></DerivedField>"),
-       270002, "DerivedField 'ratio': element 'Apply' is not supported"},
-      {Pmml("<DefineFunction name=\"f\" optype=\"continuous\"/>"), 270002,
-       "TransformationDictionary: DefineFunction 'f' is not supported"},
+      {Pmml("<DerivedField name=\"lagged\" dataType=\"double\"><Lag field=\"x\"/>"
+            "</DerivedField>"),
+       270002, "DerivedField 'lagged': element 'Lag' is not supported"},
+      {Pmml("<Taxonomy name=\"t\"/>"), 270002,
+       "TransformationDictionary: Taxonomy 't' is not supported"},
       {Pmml(Ref("a", "double", "nowhere")), 270003,
        "DerivedField 'a': FieldRef refers to 'nowhere', which is neither a data field nor a "
        "derived field"},
@@ -307,6 +308,13 @@ TEST(QZTransformation, RecordLayoutChanges) {
   ASSERT_TRUE(t.Transform(second).IsOK());
   EXPECT_EQ(second.Get("d"), Value(5.0));
 
+  // A copy shares the layout, so the binding holds for it too.
+  ValueRecord copy = second;
+  copy["z"] = 8.0;
+  ASSERT_TRUE(t.Transform(copy).IsOK());
+  EXPECT_EQ(copy.Get("d"), Value(8.0));
+  EXPECT_EQ(second.Get("d"), Value(5.0));
+
   ValueRecord third;  // the derived field first, the input after it
   third.Add("d", Value(0.0));
   third.Add("q", Value(2.0));
@@ -315,6 +323,40 @@ TEST(QZTransformation, RecordLayoutChanges) {
   EXPECT_EQ(third.Get("d"), Value(6.0));
   ASSERT_TRUE(t.Transform(first).IsOK());
   EXPECT_EQ(first.Get("d"), Value(-1.0));
+}
+
+// The layout identity the binding relies on: copies share it until one of them adds a
+// field; a record that grows keeps names at their positions but changes its size.
+TEST(QZTransformation, LayoutIdentity) {
+  ValueRecord a;
+  EXPECT_EQ(a.GetLayoutId(), 0u);
+  a.Add("x", Value(1.0));
+  const uint64_t id = a.GetLayoutId();
+  EXPECT_NE(id, 0u);
+  ValueRecord b = a;
+  EXPECT_EQ(b.GetLayoutId(), id);
+  b.Add("y", Value(2.0));
+  EXPECT_NE(b.GetLayoutId(), id);
+  EXPECT_EQ(a.GetLayoutId(), id);
+  a.Add("z", Value(3.0));  // no longer shared: grows in place, one field more
+  EXPECT_EQ(a.GetLayoutId(), id);
+  EXPECT_EQ(a.Size(), 2u);
+  a.ClearValues();
+  EXPECT_EQ(a.GetLayoutId(), id);
+
+  // The engine sees both records' own layouts, whatever order they come in.
+  QZTransformation t;
+  ASSERT_TRUE(AddDictionary(t, "<TransformationDictionary>" + Ref("d", "double", "z") +
+                                   "</TransformationDictionary>")
+                  .IsOK());
+  a["z"] = 3.0;
+  b.Add("z", Value(4.0));
+  for (int i = 0; i < 2; ++i) {
+    ASSERT_TRUE(t.Transform(a).IsOK());
+    ASSERT_TRUE(t.Transform(b).IsOK());
+  }
+  EXPECT_EQ(a.Get("d"), Value(3.0));
+  EXPECT_EQ(b.Get("d"), Value(4.0));
 }
 
 // Loading without Xerces-C++ initialised is refused, not a crash.
