@@ -44,21 +44,26 @@ class QZSCORING_API ScoringFactory {
   ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings, std::istream& pmml);
 
   // Creates a model from the files listed in "scoring_pmmlFiles": one file gives the
-  // file form; several give a multi model whose sub-models are named by
-  // "scoring_modelIDs" (one ID per file; the shorter list ends the loop). 260003 when the
-  // one file name is empty, or several files come without "scoring_modelIDs"; a failing
-  // document fails the whole model with its own code.
+  // file form (not tried while the status holds an earlier error; Detach resets it);
+  // otherwise a multi model whose sub-models are named by "scoring_modelIDs" (one ID per
+  // file; the shorter list ends the loop). 260003 when the one file name is empty, or
+  // "scoring_modelIDs" is absent; 260002 when a model is held (it stays held); a failing
+  // document fails the whole model with its own code and nothing new is held.
   ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings);
 
   // Creates a model from documents in memory: with nested settings "scoring_splitModel"
   // a split model (sub-model i from stream i, keyed by its split model ID's values),
   // else with "scoring_modelIDs" a multi model, else the stream form of the single
-  // stream (260028 for any other number of streams). The streams stay the caller's.
+  // stream (260028 for any other number of streams). The ID and stream lists are read
+  // up to the shorter one; a null stream reads as an empty document. 260002 when a model
+  // is held (it stays held). Failures as in the settings form. The streams stay the
+  // caller's.
   ScoringModel* CreateScoringModel(QZXML_800::QZSettings& settings,
                                    const std::vector<std::stringstream*>& streams);
 
-  // The setting name as a list of texts: a list of strings, or the texts of a
-  // QZVecValue<std::string>; empty when absent or of another kind.
+  // The setting name as a list of texts: a list of strings (QZVecValue<std::string>),
+  // or the texts of a QZVecValue<Value>; empty when absent or of another kind. Never
+  // throws.
   static std::vector<std::string> GetVecStringValue(const QZXML_800::QZSettings& settings,
                                                     const std::string& name);
 
@@ -73,6 +78,9 @@ class QZSCORING_API ScoringFactory {
   QZCommon_800::QZStatus GetStatus() const;
 
  private:
+  // Builds the combined models through the single-document forms (CombinedModels.cpp).
+  friend class CombinedModelCreation;
+
   QZCommon_800::QZStatus InitXerces();
   void TermXerces();
   ScoringModel* CreateFromStream(QZXML_800::QZSettings& settings, std::istream& pmml);

@@ -40,13 +40,13 @@ class QZSCORING_API ScoringSoloModel : public ScoringAbsModel {
   // propensity fields that output contains (their failures are not reported).
   // 260009 without a scorer (records untouched); otherwise the engine's code when the
   // transformation fails (the scorer is not called), or the scorer's status. An
-  // exception from the scorer or the engine gives 260009. Never throws.
+  // exception from the scorer or the engine gives 260099. Never throws.
   QZCommon_800::QZStatus Score(QZCommon_800::ValueRecord& input,
                                QZCommon_800::ValueRecord& output) override;
   // The scorer's Scorable; when it succeeds, the record has "prediction" and
   // "probability" and the model has an adjusted propensity, appends "rawpropensity"
-  // and, when the network was read, "adjustedpropensity". 260009 without a scorer or
-  // when the scorer throws. Never throws.
+  // and, when the network was read, "adjustedpropensity". 260009 without a scorer;
+  // 260099 when the scorer throws. Never throws.
   QZCommon_800::QZStatus Scorable(QZCommon_800::ValueRecord& record) override;
   // The scorer's type text; "UNKNOWN" without a scorer (or when the scorer throws).
   std::string GetModelType() const override;

@@ -9,6 +9,9 @@
 //   PLUGIN_SETTINGS     the stream attempt gives a scorer whose "prediction" and
 //                       "probability" are the model settings "test_prediction" and
 //                       "test_probability" at the time of each Score
+//   PLUGIN_ECHO         the stream attempt gives a scorer whose "prediction" is the name
+//                       of the document's target and whose "probability" echoes the
+//                       document's first input field; 78 when that field is missing
 // The scorer's type text tells the test which attempt made it and what it saw.
 
 #include <iterator>
@@ -68,6 +71,36 @@ class SettingsScorer : public IQZScore {
   QZXML_800::QZSettings& settings_;
 };
 
+class TargetEchoScorer : public IQZScore {
+ public:
+  explicit TargetEchoScorer(const QZXML_800::QZVarList& variables) {
+    if (const auto* target = variables.GetTargetRespVariable()) target_ = target->GetName();
+    for (int i = 0; i < variables.Size() && input_.empty(); ++i) {
+      if (variables.GetVarAt(i)->GetRole() == QZXML_800::ROLE_INPUT) {
+        input_ = variables.GetVarAt(i)->GetName();
+      }
+    }
+  }
+  bool IsReady() const override { return true; }
+  QZStatus Scorable(ValueRecord& record) override {
+    record.Add("prediction", Value());
+    record.Add("probability", Value());
+    return QZStatus();
+  }
+  QZStatus Score(const ValueRecord& input, ValueRecord& output) override {
+    const int at = input.IndexOf(input_);
+    if (at < 0 || input[static_cast<size_t>(at)].IsMissing()) return QZStatus(78, false);
+    output["prediction"] = target_;
+    output["probability"] = input[static_cast<size_t>(at)];
+    return QZStatus();
+  }
+  std::string GetType() const override { return "ECHO"; }
+
+ private:
+  std::string target_;
+  std::string input_;
+};
+
 class TestParser : public QZScoring_800::ScoringScoreParser {
  public:
   IQZScore* CreateFromElement(QZXML_800::QZSettings&, QZXML_800::QZVarList&,
@@ -85,6 +118,9 @@ class TestParser : public QZScoring_800::ScoringScoreParser {
                              std::istream& pmml) override {
 #if defined(PLUGIN_SETTINGS)
     return new SettingsScorer(settings);
+#endif
+#if defined(PLUGIN_ECHO)
+    return new TargetEchoScorer(variables);
 #endif
     (void)settings;
 #if defined(PLUGIN_THROWS)
