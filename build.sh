@@ -11,7 +11,7 @@ set -euo pipefail
 cd "$(dirname "$0")"
 
 packages=(cmake make g++ pkg-config ccache libxerces-c-dev libgtest-dev libgmock-dev
-          libbenchmark-dev)
+          libbenchmark-dev unzip libcli11-dev nlohmann-json3-dev)
 jobs=$(nproc 2>/dev/null || echo 2)
 
 setup() {
