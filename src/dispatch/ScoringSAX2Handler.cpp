@@ -53,6 +53,7 @@ constexpr XMLCh kDerivedFields[] = u"DerivedFields";
 constexpr XMLCh kActive[] = u"active";
 constexpr XMLCh kOrder[] = u"order";
 constexpr XMLCh kPredicted[] = u"predicted";
+constexpr XMLCh kTarget[] = u"target";  // PMML 4.2 and later name a predicted field so
 
 constexpr XMLCh kPMMLStartTagOpen[] = u"<PMML version=\"";
 constexpr XMLCh kPMMLStartTagClose[] = u"\">\n";
@@ -453,7 +454,7 @@ void ScoringPMMLSAX2Handler::AddMiningField(const Attributes& attrs) {
   if (attrs.getLength() == 0) return;
   const XMLCh* usage = attrs.getValue(kUsageType);
   const bool input = usage == nullptr || *usage == 0 || Is(usage, kActive) || Is(usage, kOrder);
-  const bool target = !input && Is(usage, kPredicted);
+  const bool target = !input && (Is(usage, kPredicted) || Is(usage, kTarget));
   if (!input && !target) return;
   std::string name = Attribute(attrs, kName);
   if (target) {

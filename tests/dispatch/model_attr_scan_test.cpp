@@ -91,6 +91,7 @@ const char kTreeDocument[] = R"(<?xml version="1.0" encoding="UTF-8"?>
       <MiningField name="income" usageType="order"/>
       <MiningField name="response" usageType="predicted"/>
       <MiningField name="weight" usageType="supplementary"/>
+      <MiningField name="response2" usageType="target"/>
       <MiningField/>
       <Extension extender="qzscoring" name="DerivedFields">
         <MiningField name="ageSquared"/>
@@ -135,7 +136,7 @@ TEST(ModelAttrScan, FillsTheRecordFromARealisticDocument) {
   // field without attributes are not recorded; a nested extension hides its fields.
   EXPECT_EQ(record.GetActiveFields(),
             (std::vector<std::string>{"colour", "age", "income", "late"}));
-  EXPECT_EQ(record.GetTargetFields(), std::vector<std::string>{"response"});
+  EXPECT_EQ(record.GetTargetFields(), (std::vector<std::string>{"response", "response2"}));
   EXPECT_EQ(record.GetDerivedInputs(), (std::vector<std::string>{"ageSquared", "ageCubed"}));
   // The first of two output fields of one name is held; a nameless one is not.
   const auto& fields = record.GetOutputFields();
