@@ -1,6 +1,8 @@
 // The loaded program: slots, dependency order, record binding and evaluation.
 #include "Program.h"
 
+#include <limits>
+
 namespace QZTransformNS_8_0_0 {
 namespace internal {
 
@@ -105,6 +107,17 @@ void Binding::Bind(const Program& program, ValueRecord& record) {
 
 namespace {
 
+// A float field holds the nearest single-precision number, as a model trained on it
+// compares it (a tree's thresholds are often single-precision numbers too). Missing
+// stays missing.
+double ToSinglePrecision(double d) {
+  if (IsMissingReal(d)) return d;
+  constexpr double kMax = std::numeric_limits<float>::max();
+  if (d > kMax) return std::numeric_limits<double>::infinity();  // no float holds it
+  if (d < -kMax) return -std::numeric_limits<double>::infinity();
+  return static_cast<double>(static_cast<float>(d));
+}
+
 // A missing value of the field's kind: system-missing for numbers, else null.
 void SetMissing(const DerivedField& field, Value& value) {
   const bool real = field.numeric || field.kind == ValueKind::kReal ||
@@ -130,10 +143,13 @@ bool Run(const Program& program, Binding& binding, ValueRecord& record, std::str
     if (field.numeric) {
       const double d = field.expr->EvalReal(ctx);
       valid = !IsInvalidReal(d);
-      if (valid) target = d;
+      if (valid) target = field.dataType == DataType::kFloat ? ToSinglePrecision(d) : d;
     } else {
       valid = field.expr->Eval(ctx, target);
       if (valid) CoerceToKind(field.kind, target);
+      if (valid && field.dataType == DataType::kFloat && target.IsNumericValue()) {
+        target = ToSinglePrecision(target.GetReal());
+      }
     }
     if (!valid) {
       const std::string where =

@@ -162,6 +162,21 @@ TEST(QZTransformation, TypingAndMissingValues) {
   ASSERT_TRUE(t.Transform(record).IsOK());
   EXPECT_TRUE(record.Get("asReal").IsSystemMissingValue());
   EXPECT_EQ(record.Get("asBool"), Value(1.0));
+
+  // A float field holds the nearest single-precision number, whatever path computed it.
+  QZTransformation single;
+  ASSERT_TRUE(AddPMML(single, Pmml(Ref("f", "float", "x") + Ref("fs", "float", "s") +
+                                   Ref("d", "double", "x")))
+                  .IsOK());
+  record["x"] = 0.1;
+  record["s"] = "0.1";
+  ASSERT_TRUE(single.Transform(record).IsOK());
+  EXPECT_EQ(record.Get("f").GetReal(), static_cast<double>(0.1f));
+  EXPECT_EQ(record.Get("fs").GetReal(), static_cast<double>(0.1f));
+  EXPECT_EQ(record.Get("d").GetReal(), 0.1);
+  record["x"] = 1e300;
+  ASSERT_TRUE(single.Transform(record).IsOK());
+  EXPECT_EQ(record.Get("f"), Value::GetInfinity());
 }
 
 // Each refusal has its status and a message naming the field and the element, and
