@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Sets up, builds and runs qzscoring on a Debian 12 machine.
 #
-#   ./build.sh demo       install what the build needs, build, score the bundled example
+#   ./build.sh demo       install what the build needs, build, score a bundled example
 #   ./build.sh test       install what the build needs, build, run the whole test suite
 #   ./build.sh sanitize   the test suite under AddressSanitizer and UndefinedBehaviorSanitizer
 #
@@ -42,7 +42,7 @@ case "${1:-}" in
   demo)
     setup
     build build
-    build/bin/score_example examples/data/house_price.pmml examples/data/houses.csv
+    build/bin/qzscore score examples/tree/iris_tree.pmml examples/tree/iris.csv
     ;;
   test)
     setup

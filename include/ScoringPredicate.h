@@ -3,10 +3,13 @@
 #ifndef QZSCORING_SCORINGPREDICATE_H_
 #define QZSCORING_SCORINGPREDICATE_H_
 
+#include <cstdint>
 #include <ostream>
 
 #include "QZScoringExport.h"
+#include "QZVarList.h"
 #include "ScoringSplitVar.h"
+#include "Value.h"
 #include "ValueRecord.h"
 
 namespace QZScoring_800 {
@@ -47,6 +50,49 @@ class QZSCORING_API ScoringPredicate {
   virtual const ScoringSplitVar* GetSplit() const = 0;
   // Writes one fixed line naming the kind of predicate.
   virtual void Display(std::ostream& out) const = 0;
+
+  // A predicate on a categorical field as plain data, for callers that keep many
+  // predicates in arrays of their own (GetCategoryTest of the simple and set
+  // predicates): the result for each of the field's first `count` categories, and for a
+  // missing value and a value that is no category. It stays valid while the predicate
+  // lives unchanged.
+  // Small (16 bytes) so that callers can keep it beside their own node data.
+  struct CategoryTest {
+    uint64_t members;    // bit i set: the predicate holds for category i
+    int32_t count;       // the categories covered, at most 64
+    uint8_t missing;     // the PredicateResult for a missing value
+    uint8_t noCategory;  // for a value that is no category of the field
+  };
+  // CategoryCode's answers besides a category's index.
+  enum CategoryCodeKind { CATEGORY_MISSING = -1, CATEGORY_NONE = -2, CATEGORY_UNDECIDED = -3 };
+  // What a categorical field's value is for a CategoryTest: the index of its category in
+  // the variable's encoder; CATEGORY_MISSING for a missing value (null, system-missing
+  // or declared missing); CATEGORY_NONE for a value that is no category;
+  // CATEGORY_UNDECIDED when the tests do not judge it (a field that is not categorical
+  // or has no categories, a number on a field of text categories, a text on one of
+  // number categories), for which the caller asks Evaluate. Never throws.
+  static int CategoryCode(const QZXML_800::IQZVariable* variable,
+                          const QZCommon_800::Value& value) noexcept;
+  // Evaluate's result for a record whose field has the CategoryCode `code`: stores it in
+  // `result` and returns true, or returns false (an undecided code, a category beyond
+  // the test's count) and the caller asks Evaluate.
+  static bool EvaluateCategoryTest(const CategoryTest& test, int code,
+                                   PredicateResult& result) noexcept {
+    if (code >= 0) {
+      if (code >= test.count) return false;
+      result = ((test.members >> code) & 1U) != 0 ? PREDICATE_TRUE : PREDICATE_FALSE;
+      return true;
+    }
+    if (code == CATEGORY_MISSING) {
+      result = static_cast<PredicateResult>(test.missing);
+      return true;
+    }
+    if (code == CATEGORY_NONE) {
+      result = static_cast<PredicateResult>(test.noCategory);
+      return true;
+    }
+    return false;
+  }
 
  protected:
   ScoringPredicate(const ScoringPredicate&) = default;

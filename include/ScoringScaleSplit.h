@@ -52,10 +52,40 @@ class QZSCORING_API ScoringScaleSplit : public ScoringSplitVar {
  private:
   friend class ScoringSimplePredicate;
 
+  // An entry's range as plain numbers, kept beside the entries while every range is
+  // exactly a ScoringRange with real bounds (the splits the PMML parsers build), so
+  // that placing a number needs no virtual call and no Value comparison.
+  struct NumericRange {
+    double low;
+    double high;
+    bool lowIncluded;
+    bool highIncluded;
+    int childIndex;
+  };
+
   // GetSplitChildIndex for a value the caller has found not missing for the variable.
   int ChildIndexOfPresent(const QZCommon_800::Value& value) const;
+  // The child index of the first range holding a real number that is not missing;
+  // `unmatched` when none does. Only while fNumericOnly.
+  int ChildIndexOfNumber(double number, int unmatched) const noexcept {
+    // The comparisons ScoringRange::IsInRange makes, for a number and bounds that are
+    // not missing.
+    for (const NumericRange& range : fNumeric) {
+      if (!(range.lowIncluded ? number >= range.low : number > range.low)) continue;
+      if (range.highIncluded ? number <= range.high : number < range.high) {
+        return range.childIndex;
+      }
+    }
+    return unmatched;
+  }
+  // Adds the numeric form of a new entry, or drops the numeric form for good.
+  void AddNumeric(const ScoringValueRange& range, int childIndex) noexcept;
+  // Rebuilds the numeric form from the entries.
+  void RebuildNumeric() noexcept;
 
   std::vector<std::pair<std::unique_ptr<ScoringValueRange>, int>> fEntries;
+  std::vector<NumericRange> fNumeric;  // one per entry while fNumericOnly
+  bool fNumericOnly = true;
 };
 
 }  // namespace QZScoring_800

@@ -51,6 +51,11 @@ class QZSCORING_API ScoringSetPredicate : public ScoringPredicate {
   QZCommon_800::Value GetScoreValue(const QZXML_800::IQZVariable* variable,
                                     const QZCommon_800::ValueRecord& record) const;
 
+  // Fills `test` and returns true when the predicate is on a field of the platform's
+  // own with 1 to 64 categories: its result for every category is worked out here
+  // once. Else returns false and leaves `test` unchanged. Never throws.
+  bool GetCategoryTest(CategoryTest& test) const noexcept;
+
  private:
   std::unique_ptr<const ScoringSplitVar> fSplit;
   // The field's position by record layout: (layout id << 24) | index; 0 when unknown.

@@ -65,11 +65,65 @@ class QZSCORING_API ScoringSimplePredicate : public ScoringPredicate {
   QZCommon_800::Value GetScoreValue(const QZXML_800::IQZVariable* variable,
                                     const QZCommon_800::ValueRecord& record) const;
 
+  // The predicate as plain data, for callers that keep many predicates in arrays of
+  // their own and read the field (GetSplit()->GetSplitName()) themselves: a comparison
+  // of a continuous field with one range of numbers, or a missing test on such a field.
+  // It stays valid while the predicate lives unchanged; it uses the field's encoder.
+  // Small (32 bytes) so that callers can keep it beside their own node data.
+  struct NumericTest {
+    double low;
+    double high;
+    const QZXML_800::IQZEncoder* encoder;  // says which numbers are declared missing
+    bool lowIncluded;
+    bool highIncluded;
+    uint8_t missing;     // the PredicateResult for a missing value
+    uint8_t inRange;     // for a number the range holds
+    uint8_t outOfRange;  // for any other number
+  };
+  // Fills `test` and returns true when the predicate can be given as a NumericTest: its
+  // split is exactly a ScoringScaleSplit with at most one range of real bounds, on a
+  // variable of the platform's own that is not categorical. Else returns false and
+  // leaves `test` unchanged. Never throws.
+  bool GetNumericTest(NumericTest& test) const noexcept;
+  // Fills `test` and returns true when the predicate is on a field of the platform's
+  // own with 1 to 64 categories: its result for every category is worked out here
+  // once. Else returns false and leaves `test` unchanged. Never throws.
+  bool GetCategoryTest(CategoryTest& test) const noexcept;
+  // Evaluate's result for a record whose field holds `value`, when the value is a real
+  // (system-missing included) or null: stores it in `result` and returns true. For any
+  // other kind of value (a text) returns false: the caller asks Evaluate.
+  static bool EvaluateNumericTest(const NumericTest& test, const QZCommon_800::Value& value,
+                                  PredicateResult& result) noexcept {
+    if (value.IsNumericValue()) {
+      const double x = value.GetReal();
+      if (value.IsSystemMissingValue() || test.encoder->IsMissingNumber(x)) {
+        result = static_cast<PredicateResult>(test.missing);
+      } else {
+        const bool above = test.lowIncluded ? x >= test.low : x > test.low;
+        const bool below = test.highIncluded ? x <= test.high : x < test.high;
+        result = static_cast<PredicateResult>(above && below ? test.inRange : test.outOfRange);
+      }
+      return true;
+    }
+    if (value.IsNull()) {
+      result = static_cast<PredicateResult>(test.missing);
+      return true;
+    }
+    return false;
+  }
+
  private:
   std::unique_ptr<const ScoringSplitVar> fSplit;
   // fSplit when it is exactly a ScoringScaleSplit, whose missing test Evaluate has
   // already made; else null.
   const ScoringScaleSplit* fScaleSplit;
+  // fScaleSplit's variable when the predicate took the split, if it is not categorical
+  // (a variable's measure level never changes): while the split still holds it, a real
+  // value is judged and placed by number without asking the variable its level.
+  const QZXML_800::IQZVariable* fContinuousVariable;
+  // The number encoder that judges fContinuousVariable's missing values when the
+  // variable is one of the platform's own, whose encoder never changes; else null.
+  const QZXML_800::IQZEncoder* fNumberEncoder;
   MissingTest fMissingTest;
   // The field's position by record layout: (layout id << 24) | index; 0 when unknown.
   mutable std::atomic<uint64_t> fFieldSlot;

@@ -51,6 +51,9 @@ class QZSCORING_API ScoringSplitVar {
   virtual void Display(std::ostream& out) const = 0;
 
  private:
+  // Reads the two members in place when it evaluates a split of a known class.
+  friend class ScoringSimplePredicate;
+
   const QZXML_800::IQZVariable* fVariable;
   int fMissvalMap;
 };

@@ -3,6 +3,7 @@
 #include <atomic>
 #include <cstddef>
 #include <cstdint>
+#include <limits>
 #include <memory>
 #include <new>
 #include <typeinfo>
@@ -81,6 +82,60 @@ const ScoringScaleSplit* ExactScaleSplit(const ScoringSplitVar* split) {
   return static_cast<const ScoringScaleSplit*>(split);
 }
 
+// The split's variable when it is not categorical; else null.
+const IQZVariable* ContinuousVariable(const ScoringScaleSplit* split) {
+  if (split == nullptr) return nullptr;
+  const IQZVariable* variable = split->GetSplitVar();
+  return variable != nullptr && !IsCategorical(variable->GetMeasureLevel()) ? variable : nullptr;
+}
+
+constexpr int kTextValues = 3;  // IQZEncoder::GetValueType of a text encoder
+
+// The encoder that judges a continuous variable's numbers, when the variable is one of
+// the platform's own (their encoder is made with them and never replaced) and the
+// encoder holds numbers; else null.
+const QZXML_800::IQZEncoder* FixedNumberEncoder(const IQZVariable* variable) {
+  if (dynamic_cast<const QZXML_800::QZVariableBase*>(variable) == nullptr) return nullptr;
+  const QZXML_800::IQZEncoder* encoder = variable->GetEncoder();
+  return encoder != nullptr && encoder->GetValueType() != kTextValues ? encoder : nullptr;
+}
+
+// ScoringPMMLParser::IsMissingValue for a real that is not system-missing, on a variable
+// that is not categorical: only the variable's encoder can still call it missing.
+bool IsDeclaredMissingNumber(const IQZVariable* variable, const QZXML_800::IQZEncoder* fixed,
+                             const Value& value) {
+  if (fixed != nullptr) return fixed->IsMissingNumber(value.GetReal());
+  const QZXML_800::IQZEncoder* encoder = variable->GetEncoder();
+  if (encoder == nullptr) return false;
+  if (encoder->GetValueType() != kTextValues) {
+    return encoder->IsMissingNumber(value.GetReal());
+  }
+  return ScoringPMMLParser::IsMissingValue(variable, value);
+}
+
+// The number of categories a CategoryTest covers for the variable: 1 to 64 for a
+// categorical variable of the platform's own (whose encoder only ever gains categories,
+// so that an index keeps naming the same category); 0 when it covers none.
+int CoveredCategories(const IQZVariable* variable) {
+  if (dynamic_cast<const QZXML_800::QZVariableBase*>(variable) == nullptr) return 0;
+  if (!IsCategorical(variable->GetMeasureLevel())) return 0;
+  const QZXML_800::IQZEncoder* encoder = variable->GetEncoder();
+  const int count = encoder != nullptr ? encoder->GetCount() : 0;
+  return count >= 1 && count <= 64 ? count : 0;
+}
+
+// Sets bit i of `test.members` when `holds` is true for category i of the variable.
+// False when the categories cannot be listed.
+template <typename Holds>
+bool SetMembers(const IQZVariable* variable, ScoringPredicate::CategoryTest& test, Holds holds) {
+  const std::vector<Value> categories = ScoringPMMLParser::GetValues(variable);
+  if (categories.size() != static_cast<size_t>(test.count)) return false;
+  for (int i = 0; i < test.count; ++i) {
+    if (holds(categories[static_cast<size_t>(i)])) test.members |= uint64_t{1} << i;
+  }
+  return true;
+}
+
 // A copy of the named field's value for callers that want their own.
 Value CopyOfField(const IQZVariable* variable, const ValueRecord& record) {
   if (variable == nullptr) return Value();
@@ -95,14 +150,47 @@ Value CopyOfField(const IQZVariable* variable, const ValueRecord& record) {
 
 ScoringPredicate::~ScoringPredicate() = default;
 
+int ScoringPredicate::CategoryCode(const IQZVariable* variable, const Value& value) noexcept {
+  if (variable == nullptr) return CATEGORY_UNDECIDED;
+  try {
+    // Missing as the missing tests see it; a predicate that is no missing test treats
+    // a missing value as it treats one that is no category.
+    if (value.IsMissing() || ScoringPMMLParser::IsMissingValue(variable, value)) {
+      return CATEGORY_MISSING;
+    }
+    const QZXML_800::IQZEncoder* encoder = variable->GetEncoder();
+    if (encoder == nullptr || encoder->GetCount() == 0) return CATEGORY_UNDECIDED;
+    // The lookups ScoringPMMLParser::IsValidValue makes, for the kinds of value whose
+    // category the splits match by that category's own value.
+    double index = -1.0;
+    const int level = variable->GetMeasureLevel();
+    if (level == QZXML_800::ML_STRING_CATEGORICAL && value.IsString()) {
+      index = encoder->IndexOfString(value.GetText());
+    } else if (level == QZXML_800::ML_NUMERIC_CATEGORICAL && value.IsNumericValue()) {
+      index = encoder->IndexOfNumber(value.GetReal());
+    } else {
+      return CATEGORY_UNDECIDED;
+    }
+    return index == -1.0 ? CATEGORY_NONE : static_cast<int>(index);
+  } catch (...) {
+    return CATEGORY_UNDECIDED;
+  }
+}
+
 // ---- ScoringSimplePredicate ----
 
 ScoringSimplePredicate::ScoringSimplePredicate()
-    : fScaleSplit(nullptr), fMissingTest(MISSING_TEST_NONE), fFieldSlot(0) {}
+    : fScaleSplit(nullptr),
+      fContinuousVariable(nullptr),
+      fNumberEncoder(nullptr),
+      fMissingTest(MISSING_TEST_NONE),
+      fFieldSlot(0) {}
 
 ScoringSimplePredicate::ScoringSimplePredicate(const ScoringSplitVar* split)
     : fSplit(split),
       fScaleSplit(ExactScaleSplit(split)),
+      fContinuousVariable(ContinuousVariable(fScaleSplit)),
+      fNumberEncoder(FixedNumberEncoder(fContinuousVariable)),
       fMissingTest(MISSING_TEST_NONE),
       fFieldSlot(0) {}
 
@@ -110,6 +198,8 @@ ScoringSimplePredicate::ScoringSimplePredicate(const ScoringSimplePredicate& oth
     : ScoringPredicate(other),
       fSplit(CloneSplit(other.fSplit.get())),
       fScaleSplit(ExactScaleSplit(fSplit.get())),
+      fContinuousVariable(ContinuousVariable(fScaleSplit)),
+      fNumberEncoder(FixedNumberEncoder(fContinuousVariable)),
       fMissingTest(other.fMissingTest),
       fFieldSlot(0) {}
 
@@ -117,6 +207,8 @@ ScoringSimplePredicate& ScoringSimplePredicate::operator=(const ScoringSimplePre
   if (this == &other) return *this;
   fSplit = CloneSplit(other.fSplit.get());
   fScaleSplit = ExactScaleSplit(fSplit.get());
+  fContinuousVariable = ContinuousVariable(fScaleSplit);
+  fNumberEncoder = FixedNumberEncoder(fContinuousVariable);
   fMissingTest = other.fMissingTest;
   fFieldSlot.store(0, std::memory_order_relaxed);
   return *this;
@@ -137,6 +229,21 @@ ScoringPredicate::PredicateResult ScoringSimplePredicate::Evaluate(
   const ScoringSplitVar* split = fSplit.get();
   if (split == nullptr) return PREDICATE_UNKNOWN;
   try {
+    // The common case: a comparison of a continuous field's real value with numbers.
+    // The split is exactly a ScoringScaleSplit, so its members are read in place.
+    if (fScaleSplit != nullptr && fScaleSplit->fNumericOnly && fMissingTest == MISSING_TEST_NONE &&
+        fContinuousVariable != nullptr && fScaleSplit->fVariable == fContinuousVariable) {
+      const Value& value = FieldValue(record, fContinuousVariable, fFieldSlot);
+      if (value.IsNumericValue()) {
+        const int unmatched = fScaleSplit->fMissvalMap;
+        if (value.IsSystemMissingValue() ||
+            IsDeclaredMissingNumber(fContinuousVariable, fNumberEncoder, value)) {
+          return unmatched != -1 ? PREDICATE_TRUE : PREDICATE_UNKNOWN;
+        }
+        const int index = fScaleSplit->ChildIndexOfNumber(value.GetReal(), unmatched);
+        return index == -1 ? PREDICATE_FALSE : PREDICATE_TRUE;
+      }
+    }
     const IQZVariable* variable = split->GetSplitVar();
     const Value& value = FieldValue(record, variable, fFieldSlot);
     if (fMissingTest != MISSING_TEST_NONE) {
@@ -160,6 +267,83 @@ ScoringPredicate::PredicateResult ScoringSimplePredicate::Evaluate(
   }
 }
 
+bool ScoringSimplePredicate::GetNumericTest(NumericTest& test) const noexcept {
+  // The cases Evaluate answers from the number alone: a real is judged missing by the
+  // encoder and placed by the split's one numeric range; null is missing.
+  const ScoringScaleSplit* split = fScaleSplit;
+  if (split == nullptr || !split->fNumericOnly || split->fNumeric.size() > 1 ||
+      fNumberEncoder == nullptr || split->fVariable != fContinuousVariable) {
+    return false;
+  }
+  NumericTest form{0.0, 0.0, fNumberEncoder, false, false,
+                   PREDICATE_UNKNOWN, PREDICATE_FALSE, PREDICATE_FALSE};
+  if (split->fNumeric.empty()) {
+    form.low = std::numeric_limits<double>::infinity();  // holds no number
+    form.high = -form.low;
+  } else {
+    const ScoringScaleSplit::NumericRange& range = split->fNumeric.front();
+    form.low = range.low;
+    form.high = range.high;
+    form.lowIncluded = range.lowIncluded;
+    form.highIncluded = range.highIncluded;
+  }
+  const int unmatched = split->fMissvalMap;
+  switch (fMissingTest) {
+    case MISSING_TEST_NONE:
+      form.missing = unmatched != -1 ? PREDICATE_TRUE : PREDICATE_UNKNOWN;
+      form.inRange = split->fNumeric.empty() || split->fNumeric.front().childIndex != -1
+                         ? PREDICATE_TRUE
+                         : PREDICATE_FALSE;
+      form.outOfRange = unmatched != -1 ? PREDICATE_TRUE : PREDICATE_FALSE;
+      break;
+    case MISSING_TEST_IS_MISSING:
+      form.missing = PREDICATE_TRUE;
+      break;
+    case MISSING_TEST_IS_NOT_MISSING:
+      form.missing = PREDICATE_FALSE;
+      form.inRange = form.outOfRange = PREDICATE_TRUE;
+      break;
+    default:
+      return false;
+  }
+  test = form;
+  return true;
+}
+
+bool ScoringSimplePredicate::GetCategoryTest(CategoryTest& test) const noexcept {
+  const ScoringSplitVar* split = fSplit.get();
+  if (split == nullptr) return false;
+  try {
+    const IQZVariable* variable = split->GetSplitVar();
+    CategoryTest form{0, CoveredCategories(variable), PREDICATE_UNKNOWN, PREDICATE_UNKNOWN};
+    if (form.count == 0) return false;
+    if (fMissingTest != MISSING_TEST_NONE) {
+      // A value that is no category is present, not missing.
+      const bool isMissing = fMissingTest == MISSING_TEST_IS_MISSING;
+      form.missing = isMissing ? PREDICATE_TRUE : PREDICATE_FALSE;
+      form.noCategory = isMissing ? PREDICATE_FALSE : PREDICATE_TRUE;
+      if (!isMissing) {
+        form.members = form.count == 64 ? ~uint64_t{0} : (uint64_t{1} << form.count) - 1;
+      }
+    } else {
+      // As Evaluate answers a valid category, and a missing or invalid value.
+      form.missing = form.noCategory =
+          split->GetMissvalMap() != -1 ? PREDICATE_TRUE : PREDICATE_UNKNOWN;
+      const ScoringScaleSplit* scale = fScaleSplit;
+      const bool listed = SetMembers(variable, form, [split, scale](const Value& category) {
+        const int index = scale != nullptr ? scale->ChildIndexOfPresent(category)
+                                           : split->GetSplitChildIndex(&category);
+        return index != -1;
+      });
+      if (!listed) return false;
+    }
+    test = form;
+    return true;
+  } catch (...) {
+    return false;
+  }
+}
+
 ScoringPredicate::PredicateType ScoringSimplePredicate::GetPredType() const {
   return SIMPLE_PREDICATE;
 }
@@ -170,6 +354,8 @@ void ScoringSimplePredicate::SetSplit(const ScoringSplitVar* split) {
   if (split == fSplit.get()) return;
   fSplit.reset(split);
   fScaleSplit = ExactScaleSplit(split);
+  fContinuousVariable = ContinuousVariable(fScaleSplit);
+  fNumberEncoder = FixedNumberEncoder(fContinuousVariable);
   fFieldSlot.store(0, std::memory_order_relaxed);
 }
 
@@ -233,6 +419,25 @@ ScoringPredicate::PredicateResult ScoringSetPredicate::Evaluate(const ValueRecor
     return split->GetSplitChildIndex(&value) == -1 ? PREDICATE_FALSE : PREDICATE_TRUE;
   } catch (...) {
     return PREDICATE_UNKNOWN;
+  }
+}
+
+bool ScoringSetPredicate::GetCategoryTest(CategoryTest& test) const noexcept {
+  const ScoringSplitVar* split = fSplit.get();
+  if (split == nullptr) return false;
+  try {
+    const IQZVariable* variable = split->GetSplitVar();
+    // Missing and invalid values are unknown; a category holds when its child is one.
+    CategoryTest form{0, CoveredCategories(variable), PREDICATE_UNKNOWN, PREDICATE_UNKNOWN};
+    if (form.count == 0) return false;
+    const bool listed = SetMembers(variable, form, [split](const Value& category) {
+      return split->GetSplitChildIndex(&category) != -1;
+    });
+    if (!listed) return false;
+    test = form;
+    return true;
+  } catch (...) {
+    return false;
   }
 }
 

@@ -5,6 +5,7 @@
 #include <new>
 #include <ostream>
 #include <string>
+#include <typeinfo>
 #include <unordered_map>
 #include <utility>
 #include <vector>
@@ -13,6 +14,7 @@
 #include "QZVarList.h"
 #include "ScoringDiscreteSplit.h"
 #include "ScoringPMMLParser.h"
+#include "ScoringRange.h"
 #include "ScoringScaleSplit.h"
 #include "ScoringSplitVar.h"
 #include "Value.h"
@@ -297,11 +299,13 @@ ScoringScaleSplit::ScoringScaleSplit(const IQZVariable* variable) : ScoringSplit
 
 ScoringScaleSplit::ScoringScaleSplit(const ScoringScaleSplit& other) : ScoringSplitVar(other) {
   AppendClones(other.fEntries, fEntries);
+  RebuildNumeric();
 }
 
 ScoringScaleSplit& ScoringScaleSplit::operator=(const ScoringScaleSplit& other) {
   if (this == &other) return *this;
   AppendClones(other.fEntries, fEntries);
+  RebuildNumeric();
   ScoringSplitVar::operator=(other);
   return *this;
 }
@@ -328,6 +332,9 @@ int ScoringScaleSplit::ChildIndexOfPresent(const Value& value) const {
   // A text on a field that is not text-categorical is placed by the number it reads as
   // (it is no missing value, so it reads as one): Value's order would put every text
   // above every number.
+  if (fNumericOnly && value.IsNumericValue()) {
+    return ChildIndexOfNumber(value.GetReal(), GetMissvalMap());
+  }
   const Value* probe = &value;
   Value number;
   const IQZVariable* variable = GetSplitVar();
@@ -352,10 +359,39 @@ void ScoringScaleSplit::Display(std::ostream& out) const {
   out << "\n";
 }
 
+void ScoringScaleSplit::AddNumeric(const ScoringValueRange& range, int childIndex) noexcept {
+  if (!fNumericOnly) return;
+  const Value* low = range.GetMin();
+  const Value* high = range.GetMax();
+  // A class derived from ScoringRange may place values its own way.
+  const bool plain = typeid(range) == typeid(ScoringRange) && low != nullptr &&
+                     high != nullptr && low->IsNumericValue() && high->IsNumericValue() &&
+                     !low->IsSystemMissingValue() && !high->IsSystemMissingValue();
+  if (plain) {
+    try {
+      fNumeric.push_back({low->GetReal(), high->GetReal(), range.GetLowEnd(),
+                          range.GetHighEnd(), childIndex});
+      return;
+    } catch (...) {
+      // Out of memory: ranges are then placed through their own IsInRange.
+    }
+  }
+  fNumericOnly = false;
+  fNumeric.clear();
+  fNumeric.shrink_to_fit();
+}
+
+void ScoringScaleSplit::RebuildNumeric() noexcept {
+  fNumericOnly = true;
+  fNumeric.clear();
+  for (const auto& entry : fEntries) AddNumeric(*entry.first, entry.second);
+}
+
 void ScoringScaleSplit::PutSplit(ScoringValueRange* range, int childIndex) {
   std::unique_ptr<ScoringValueRange> owned(range);
   if (!owned) return;
   fEntries.emplace_back(std::move(owned), childIndex);
+  AddNumeric(*fEntries.back().first, childIndex);
 }
 
 const ScoringValueRange* ScoringScaleSplit::GetSplitValueRangeForIndex(int index) const {

@@ -44,6 +44,12 @@ namespace {
 const std::set<std::string> kExpectedToPass = {
     "IrisLinearReg",          "IrisMultinomReg",         "HousingLinearRegressor",
     "HousingLinearRegressor_PCA", "HousingLRClassifier", "HousingLRClassifier_PCA",
+    "IrisTree",               "AuditTree",               "single_iris_dectree",
+    "single_audit_dectree",
+    "AuditRandomForest",      "IrisRandomForest",        "ensemble_audit_dectree",
+    "ensemble_iris_dectree",  "HousingGBTClassifier",    "HousingGBTClassifier_PCA",
+    "HousingGBTRegressor_PCA", "HousingRFClassifier_PCA", "HousingRFRegressor_PCA",
+    "HousingGBTRegressor",    "HousingRFClassifier",     "HousingRFRegressor",
 };
 
 bool IsDirectory(const std::string& path) {

@@ -221,10 +221,6 @@ TEST(RegressionPlugin, RefusesUnsupportedDocuments) {
           <RegressionModel functionName="regression"><MiningSchema>
           <MiningField name="x" outliers="asExtremeValues"/></MiningSchema>
           <RegressionTable intercept="0"/></RegressionModel></PMML>)"},
-      {"QZTree: refused: model element 'TreeModel' is not supported", R"(<PMML version="4.1"><DataDictionary>
-          <DataField name="x" optype="continuous" dataType="double"/></DataDictionary>
-          <TreeModel functionName="regression"><MiningSchema><MiningField name="x"/>
-          </MiningSchema><Node score="1"><True/></Node></TreeModel></PMML>)"},
   };
   for (const auto& c : cases) {
     std::ostringstream notes;

@@ -30,9 +30,14 @@ using QZCommon_800::ValueRecord;
 
 namespace {
 
-// Tracing on from the first trace call of the process: the test runs in a scratch folder.
+// Tracing on for the whole process: the level is read once, at the first trace call,
+// which this makes (GetScoringNames traces) while component.cfg asks for level 2. Each
+// test runs in its own folder, and a line is written only where component.cfg exists.
+void EnableTracingHere() { std::ofstream("component.cfg") << "loglevel,2\n"; }
 const bool kTracing = [] {
-  std::ofstream("component.cfg") << "loglevel,2\n";
+  EnableTracingHere();
+  std::map<std::string, std::string> names;
+  ScoringScorerFactory::GetScoringNames(names, QZXML_800::QZSettings());
   return true;
 }();
 
@@ -281,6 +286,7 @@ TEST_F(PredicateParsingTest, CompoundPredicates) {
   EXPECT_EQ(compound->GetPredicates()[1]->GetPredType(), ScoringPredicate::COMPOUND_PREDICATE);
   EXPECT_EQ(compound->GetPredicates()[2]->GetPredType(), ScoringPredicate::SIMPLE_PREDICATE);
 
+  EnableTracingHere();
   auto before = TraceFiles();
   EXPECT_EQ(Parse(R"(<CompoundPredicate booleanOperator="and"><True/>
                           <CompoundPredicate booleanOperator="or"><False/>
