@@ -5,8 +5,8 @@
 #include <cstdint>
 #include <limits>
 #include <memory>
+#include <iterator>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include <xercesc/dom/DOMElement.hpp>

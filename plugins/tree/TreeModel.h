@@ -14,7 +14,13 @@ namespace QZPlugin_800 {
 // ScoreDistributions (probabilities from `probability` or from record counts,
 // confidences) and node ids as the entity id. Anything else in a tree (an unknown
 // predicate or operator, an embedded model, a strategy outside the list) refuses the
-// model at compile time.
+// model at compile time (CompileError).
+//
+// The tree is compiled into a flat array of nodes, children consecutive, each holding
+// the plain form of its predicate the library gives (NumericTest, CategoryTest) where
+// it has one, so that scoring reads fields by the model's slots and calls a predicate
+// object only for what those forms leave open. Its evaluator keeps per-record scratch:
+// one thread at a time, like the compiled model that owns it.
 void RegisterTreeModel(KindRegistry& registry);
 
 }  // namespace QZPlugin_800

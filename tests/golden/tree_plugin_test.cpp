@@ -77,10 +77,14 @@ std::string Document(const std::string& function, const std::string& attributes,
 
 // A root with two leaves: x < 5 gives A (counts 3/1), else B (counts 1/3).
 const char kTwoLeaves[] = R"(<Node id="0" score="A" recordCount="8" defaultChild="1"><True/>
-  <Node id="1" score="A" recordCount="4"><SimplePredicate field="x" operator="lessThan" value="5"/>
-    <ScoreDistribution value="A" recordCount="3"/><ScoreDistribution value="B" recordCount="1"/></Node>
-  <Node id="2" score="B" recordCount="4"><SimplePredicate field="x" operator="greaterOrEqual" value="5"/>
-    <ScoreDistribution value="A" recordCount="1"/><ScoreDistribution value="B" recordCount="3"/></Node>
+  <Node id="1" score="A" recordCount="4">
+    <SimplePredicate field="x" operator="lessThan" value="5"/>
+    <ScoreDistribution value="A" recordCount="3"/><ScoreDistribution value="B" recordCount="1"/>
+  </Node>
+  <Node id="2" score="B" recordCount="4">
+    <SimplePredicate field="x" operator="greaterOrEqual" value="5"/>
+    <ScoreDistribution value="A" recordCount="1"/><ScoreDistribution value="B" recordCount="3"/>
+  </Node>
 </Node>)";
 
 // A range of a class of its own: its splits place values through IsInRange, the way
@@ -93,8 +97,8 @@ class PlainRange : public ScoringRange {
 
 // For every value, the plain forms the predicate gives (NumericTest, CategoryTest)
 // answer as Evaluate does wherever they decide. Returns how many answers they gave.
-int ExpectPlainFormsAgree(const ScoringPredicate& predicate,
-                          const QZXML_800::IQZVariable* variable, const std::vector<Value>& values) {
+int ExpectPlainFormsAgree(const ScoringPredicate& predicate, const QZXML_800::IQZVariable* variable,
+                          const std::vector<Value>& values) {
   ValueRecord record;
   record.Add(variable->GetName(), Value());
   ScoringSimplePredicate::NumericTest numeric{};
@@ -302,24 +306,34 @@ TEST(TreePlugin, CategoryTestsAgreeWithEvaluate) {
                                     Value(QZCommon_800::QZMV::Missing())};
   const std::vector<Value> numbers = {Value(1.0), Value(2.0), Value(3.0), Value(5.0),
                                       Value("2"), Value("2.0"), Value()};
-  std::vector<std::pair<std::unique_ptr<ScoringPredicate>, const QZXML_800::IQZVariable*>> cases;
-  cases.emplace_back(std::make_unique<ScoringSimplePredicate>(split(c, {Value("g")}, -1)), c);
-  cases.emplace_back(std::make_unique<ScoringSimplePredicate>(split(c, {Value("r"), Value("b")}, -1)), c);
-  cases.emplace_back(std::make_unique<ScoringSimplePredicate>(split(c, {}, 0)), c);
+  // Simple: equal g, not equal g, empty equal (missing-value map 0), the two missing
+  // tests; set: isIn g b, a set naming no category with map 0; then on n.
+  using Case = std::pair<std::unique_ptr<ScoringPredicate>, const QZXML_800::IQZVariable*>;
+  std::vector<Case> cases;
+  auto simple = [&](const QZXML_800::IQZVariable* on, std::vector<Value> entries, int map) {
+    cases.emplace_back(std::make_unique<ScoringSimplePredicate>(split(on, entries, map)), on);
+  };
+  auto set = [&](const QZXML_800::IQZVariable* on, std::vector<Value> entries, int map) {
+    cases.emplace_back(std::make_unique<ScoringSetPredicate>(split(on, entries, map)), on);
+  };
+  simple(c, {Value("g")}, -1);
+  simple(c, {Value("r"), Value("b")}, -1);
+  simple(c, {}, 0);
   for (auto test : {ScoringSimplePredicate::MISSING_TEST_IS_MISSING,
                     ScoringSimplePredicate::MISSING_TEST_IS_NOT_MISSING}) {
     auto missing = std::make_unique<ScoringSimplePredicate>(split(c, {}, 0));
     missing->SetMissingTest(test);
     cases.emplace_back(std::move(missing), c);
   }
-  cases.emplace_back(std::make_unique<ScoringSetPredicate>(split(c, {Value("g"), Value("b")}, -1)), c);
-  cases.emplace_back(std::make_unique<ScoringSetPredicate>(split(c, {Value("g"), Value("zz")}, 0)), c);
-  cases.emplace_back(std::make_unique<ScoringSimplePredicate>(split(n, {Value(2.0)}, -1)), n);
-  cases.emplace_back(std::make_unique<ScoringSetPredicate>(split(n, {Value("2"), Value("3")}, -1)), n);
-  for (const auto& entry : cases) {
+  set(c, {Value("g"), Value("b")}, -1);
+  set(c, {Value("g"), Value("zz")}, 0);
+  simple(n, {Value(2.0)}, -1);
+  set(n, {Value("2"), Value("3")}, -1);
+  for (const Case& entry : cases) {
     // Texts on c: all but the number 1.0; numbers on n: all but the two texts.
-    EXPECT_EQ(ExpectPlainFormsAgree(*entry.first, entry.second, entry.second == c ? texts : numbers),
-              entry.second == c ? 8 : 5);
+    const bool text = entry.second == c;
+    EXPECT_EQ(ExpectPlainFormsAgree(*entry.first, entry.second, text ? texts : numbers),
+              text ? 8 : 5);
   }
   EXPECT_EQ(ScoringPredicate::CategoryCode(c, Value("b")), 2);
   EXPECT_EQ(ScoringPredicate::CategoryCode(c, Value("zz")), ScoringPredicate::CATEGORY_NONE);
