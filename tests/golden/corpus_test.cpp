@@ -30,6 +30,7 @@
 #include "ScoringModel.h"
 #include "Value.h"
 #include "ValueRecord.h"
+#include "ReferencePlugins.h"
 
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
@@ -123,20 +124,6 @@ bool Agrees(const std::string& expected, const Value& actual) {
   return actual.GetString() == expected;
 }
 
-QZSettings Registry() {
-  QZSettings scoring, models, settings;
-  scoring.AddSetting("TreeModel", "QZTree", false);
-  scoring.AddSetting("RegressionModel", "QZRegression", false);
-  scoring.AddSetting("MiningModel", "QZMining", false);
-  scoring.AddSetting("Veritor", "QZMining", false);
-  models.AddSetting("MiningModel", "", false);
-  models.AddSetting("TreeModel", "", false);
-  models.AddSetting("RegressionModel", "", false);
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  return settings;
-}
-
 struct Outcome {
   std::string model;
   long records = 0;
@@ -159,7 +146,7 @@ Outcome RunDataset(const std::string& model, const std::string& pmml, const std:
     outcome.note = "cannot open " + csv;
     return outcome;
   }
-  QZSettings settings = Registry();
+  QZSettings settings = qztest::ReferenceRegistry();
   ScoringFactory factory;
   std::unique_ptr<ScoringModel> scoring(factory.CreateScoringModel(settings, pmml));
   factory.Detach();

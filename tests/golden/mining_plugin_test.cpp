@@ -15,38 +15,17 @@
 #include <gtest/gtest.h>
 
 #include "QZDisplay.h"
-#include "ScoringFactory.h"
 #include "ScoringModel.h"
 #include "Value.h"
 #include "ValueRecord.h"
+#include "ReferencePlugins.h"
 
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
-using QZScoring_800::ScoringFactory;
 using QZScoring_800::ScoringModel;
 using QZXML_800::QZSettings;
 
 namespace {
-
-QZSettings Registry() {
-  QZSettings scoring, models, settings;
-  scoring.AddSetting("Veritor", "QZMining", false);
-  scoring.AddSetting("MiningModel", "QZMining", false);
-  models.AddSetting("MiningModel", "", false);
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  return settings;
-}
-
-std::unique_ptr<ScoringModel> Create(const std::string& pmml, long* status = nullptr) {
-  QZSettings settings = Registry();
-  ScoringFactory factory;
-  std::istringstream in(pmml);
-  std::unique_ptr<ScoringModel> model(factory.CreateScoringModel(settings, in));
-  if (status != nullptr) *status = factory.GetStatus().GetErrorCode();
-  factory.Detach();
-  return model;
-}
 
 // y = intercept + coefficient * field.
 std::string Linear(const std::string& field, double intercept, double coefficient) {
@@ -121,7 +100,7 @@ TEST(MiningPlugin, MissingSegmentPredictions) {
       {R"(multipleModelMethod="modelChain" missingPredictionTreatment="returnMissing")", kMissing},
   };
   for (const auto& c : cases) {
-    auto model = Create(Document(c.segmentation, kThree));
+    auto model = qztest::CreateModel(Document(c.segmentation, kThree));
     ASSERT_NE(model, nullptr) << c.segmentation;
     EXPECT_EQ(model->GetModelType(), "MiningModel");
     long status = -1;
@@ -141,7 +120,7 @@ TEST(MiningPlugin, MissingSegmentPredictions) {
 // a structured value with every segment's prediction by id (null when the segment was
 // not used or predicted nothing).
 TEST(MiningPlugin, SelectAllListsEverySegment) {
-  auto model = Create(Document(
+  auto model = qztest::CreateModel(Document(
       R"(multipleModelMethod="selectAll")",
       Segment("first", Linear("x", 0, 1),
               R"(<SimplePredicate field="x" operator="greaterThan" value="5"/>)") + kThree,
@@ -203,7 +182,7 @@ TEST(MiningPlugin, RefusesUnsupportedDocuments) {
     std::ostringstream notes;
     QZDisplay_800::SetDisplayStream(&notes);
     long status = 0;
-    auto model = Create(c.pmml, &status);
+    auto model = qztest::CreateModel(c.pmml, &status);
     QZDisplay_800::SetDisplayStream(&std::cerr);
     EXPECT_EQ(model, nullptr) << c.message;
     EXPECT_EQ(status, 260010) << c.message;
@@ -215,8 +194,8 @@ TEST(MiningPlugin, RefusesUnsupportedDocuments) {
 // each gives alone: the ensemble's scratch and its segments belong to one model.
 TEST(MiningPlugin, ModelsScoreIndependentlyInThreads) {
   const std::string pmml = Document(R"(multipleModelMethod="weightedMedian")", kThree);
-  auto first = Create(pmml);
-  auto second = Create(pmml);
+  auto first = qztest::CreateModel(pmml);
+  auto second = qztest::CreateModel(pmml);
   ASSERT_NE(first, nullptr);
   ASSERT_NE(second, nullptr);
   auto run = [](ScoringModel* model, std::vector<double>* out) {

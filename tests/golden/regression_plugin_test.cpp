@@ -11,41 +11,17 @@
 #include <gtest/gtest.h>
 
 #include "QZDisplay.h"
-#include "ScoringFactory.h"
 #include "ScoringModel.h"
 #include "Value.h"
 #include "ValueRecord.h"
+#include "ReferencePlugins.h"
 
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
-using QZScoring_800::ScoringFactory;
 using QZScoring_800::ScoringModel;
 using QZXML_800::QZSettings;
 
 namespace {
-
-QZSettings Registry() {
-  QZSettings scoring, models, settings;
-  scoring.AddSetting("RegressionModel", "QZRegression", false);
-  scoring.AddSetting("TreeModel", "QZTree", false);
-  scoring.AddSetting("Veritor", "QZMining", false);
-  models.AddSetting("RegressionModel", "", false);
-  models.AddSetting("TreeModel", "", false);
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  return settings;
-}
-
-// A model created from the document text; null (with the factory's status) on failure.
-std::unique_ptr<ScoringModel> Create(const std::string& pmml, long* status = nullptr) {
-  QZSettings settings = Registry();
-  ScoringFactory factory;
-  std::istringstream in(pmml);
-  std::unique_ptr<ScoringModel> model(factory.CreateScoringModel(settings, in));
-  if (status != nullptr) *status = factory.GetStatus().GetErrorCode();
-  factory.Detach();
-  return model;
-}
 
 // x (continuous) predicts y: continuous for regression, categories A, B, C or N, Y for
 // classification. `body` is the inside of the RegressionModel after its MiningSchema.
@@ -99,7 +75,7 @@ TEST(RegressionPlugin, RegressionNormalizations) {
                {"probit", 0.8413447460685429}, {"cloglog", 0.9340119641546875},
                {"loglog", 0.6922006275553464}, {"cauchit", 0.75}};
   for (const auto& c : cases) {
-    auto model = Create(Document("regression", c.method, "", kOneTable));
+    auto model = qztest::CreateModel(Document("regression", c.method, "", kOneTable));
     ASSERT_NE(model, nullptr) << c.method;
     EXPECT_EQ(model->GetModelType(), "RegressionModel");
     EXPECT_NEAR(Score(*model, 0.25).Get("prediction").GetReal(), c.expected, 1e-12) << c.method;
@@ -126,7 +102,8 @@ TEST(RegressionPlugin, ClassificationNormalizations) {
       {"exp", "A", 7.38905609893065, 1.6487212707001282, 1.0},
   };
   for (const auto& m : multi) {
-    auto model = Create(Document("classification", m.method, "ABC", kThreeTables));
+    auto model =
+        qztest::CreateModel(Document("classification", m.method, "ABC", kThreeTables));
     ASSERT_NE(model, nullptr) << m.method;
     const ValueRecord out = Score(*model, 1.0);
     EXPECT_EQ(out.Get("prediction").GetString(), m.predicted) << m.method;
@@ -149,7 +126,7 @@ TEST(RegressionPlugin, ClassificationNormalizations) {
   for (const auto& b : binary) {
     for (const char* tables : {kTwoTables, R"(<RegressionTable intercept="0" targetCategory="Y">
           <NumericPredictor name="x" coefficient="1"/></RegressionTable>)"}) {
-      auto model = Create(Document("classification", b.method, "NY", tables));
+      auto model = qztest::CreateModel(Document("classification", b.method, "NY", tables));
       ASSERT_NE(model, nullptr) << b.method;
       const ValueRecord out = Score(*model, 0.3);
       EXPECT_EQ(out.Get("prediction").GetString(), b.predicted) << b.method;
@@ -163,8 +140,9 @@ TEST(RegressionPlugin, ClassificationNormalizations) {
 // dictionary order, then the OutputFields as named; a host record that lacks them gets
 // them appended by Score. A missing input gives null fields and success.
 TEST(RegressionPlugin, OutputLayout) {
-  auto model = Create(Document("classification", "softmax", "CAB", kThreeTables + std::string(
-      R"(<Output><OutputField name="best" feature="predictedValue"/>
+  auto model = qztest::CreateModel(
+      Document("classification", "softmax", "CAB",
+               kThreeTables + std::string(R"(<Output><OutputField name="best" feature="predictedValue"/>
          <OutputField name="pB" feature="probability" value="B"/></Output>)")));
   ASSERT_NE(model, nullptr);
   ValueRecord layout;
@@ -226,7 +204,7 @@ TEST(RegressionPlugin, RefusesUnsupportedDocuments) {
     std::ostringstream notes;
     QZDisplay_800::SetDisplayStream(&notes);
     long status = 0;
-    auto model = Create(c.pmml, &status);
+    auto model = qztest::CreateModel(c.pmml, &status);
     QZDisplay_800::SetDisplayStream(&std::cerr);
     EXPECT_EQ(model, nullptr) << c.message;
     EXPECT_EQ(status, 260010) << c.message;
@@ -238,8 +216,8 @@ TEST(RegressionPlugin, RefusesUnsupportedDocuments) {
 // give the results each gives alone.
 TEST(RegressionPlugin, ModelsScoreIndependentlyInThreads) {
   const std::string pmml = Document("classification", "softmax", "ABC", kThreeTables);
-  auto first = Create(pmml);
-  auto second = Create(pmml);
+  auto first = qztest::CreateModel(pmml);
+  auto second = qztest::CreateModel(pmml);
   ASSERT_NE(first, nullptr);
   ASSERT_NE(second, nullptr);
   auto run = [](ScoringModel* model, std::vector<double>* out) {

@@ -16,7 +16,6 @@
 #include "QZDisplay.h"
 #include "QZMV.h"
 #include "QZVarList.h"
-#include "ScoringFactory.h"
 #include "ScoringModel.h"
 #include "ScoringDiscreteSplit.h"
 #include "ScoringRange.h"
@@ -25,10 +24,10 @@
 #include "ScoringSimplePredicate.h"
 #include "Value.h"
 #include "ValueRecord.h"
+#include "ReferencePlugins.h"
 
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
-using QZScoring_800::ScoringFactory;
 using QZScoring_800::ScoringDiscreteSplit;
 using QZScoring_800::ScoringModel;
 using QZScoring_800::ScoringPredicate;
@@ -39,22 +38,6 @@ using QZScoring_800::ScoringSimplePredicate;
 using QZXML_800::QZSettings;
 
 namespace {
-
-// A model created from the document text; null (with the factory's status) on failure.
-std::unique_ptr<ScoringModel> Create(const std::string& pmml, long* status = nullptr) {
-  QZSettings scoring, models, settings;
-  scoring.AddSetting("TreeModel", "QZTree", false);
-  scoring.AddSetting("Veritor", "QZMining", false);
-  models.AddSetting("TreeModel", "", false);
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  ScoringFactory factory;
-  std::istringstream in(pmml);
-  std::unique_ptr<ScoringModel> model(factory.CreateScoringModel(settings, in));
-  if (status != nullptr) *status = factory.GetStatus().GetErrorCode();
-  factory.Detach();
-  return model;
-}
 
 // x (continuous) and c (r, g, b) predict y: A or B for classification, a number for
 // regression. `attributes` go on the TreeModel, `nodes` is everything after its
@@ -183,7 +166,7 @@ TEST(TreePlugin, RefusesUnsupportedDocuments) {
     std::ostringstream notes;
     QZDisplay_800::SetDisplayStream(&notes);
     long status = 0;
-    auto model = Create(c.pmml, &status);
+    auto model = qztest::CreateModel(c.pmml, &status);
     QZDisplay_800::SetDisplayStream(&std::cerr);
     EXPECT_EQ(model, nullptr) << c.message;
     EXPECT_EQ(status, 260010) << c.message;
@@ -197,8 +180,8 @@ TEST(TreePlugin, RefusesUnsupportedDocuments) {
 TEST(TreePlugin, ModelsScoreIndependentlyInThreads) {
   const std::string pmml =
       Document("classification", R"(missingValueStrategy="weightedConfidence")", kTwoLeaves);
-  auto first = Create(pmml);
-  auto second = Create(pmml);
+  auto first = qztest::CreateModel(pmml);
+  auto second = qztest::CreateModel(pmml);
   ASSERT_NE(first, nullptr);
   ASSERT_NE(second, nullptr);
   auto run = [](ScoringModel* model, std::vector<double>* out) {

@@ -1,0 +1,44 @@
+// The registry that sends every model element to the reference plug-ins (as qzscore's
+// built-in one does), and a model created from document text through the factory.
+#ifndef QZ_TESTS_REFERENCE_PLUGINS_H_
+#define QZ_TESTS_REFERENCE_PLUGINS_H_
+
+#include <memory>
+#include <sstream>
+#include <string>
+
+#include "QZSettings.h"
+#include "ScoringFactory.h"
+#include "ScoringModel.h"
+
+namespace qztest {
+
+inline QZXML_800::QZSettings ReferenceRegistry() {
+  QZXML_800::QZSettings scoring, models, settings;
+  scoring.AddSetting("TreeModel", "QZTree", false);
+  scoring.AddSetting("RegressionModel", "QZRegression", false);
+  scoring.AddSetting("MiningModel", "QZMining", false);
+  scoring.AddSetting("Veritor", "QZMining", false);
+  models.AddSetting("MiningModel", "", false);
+  models.AddSetting("TreeModel", "", false);
+  models.AddSetting("RegressionModel", "", false);
+  settings.AddSetting("scoringDll", scoring, true);
+  settings.AddSetting("modelDll", models, true);
+  return settings;
+}
+
+// Null (with the factory's status in *status) when the model cannot be created.
+inline std::unique_ptr<QZScoring_800::ScoringModel> CreateModel(const std::string& pmml,
+                                                                 long* status = nullptr) {
+  QZXML_800::QZSettings settings = ReferenceRegistry();
+  QZScoring_800::ScoringFactory factory;
+  std::istringstream in(pmml);
+  std::unique_ptr<QZScoring_800::ScoringModel> model(factory.CreateScoringModel(settings, in));
+  if (status != nullptr) *status = factory.GetStatus().GetErrorCode();
+  factory.Detach();
+  return model;
+}
+
+}  // namespace qztest
+
+#endif  // QZ_TESTS_REFERENCE_PLUGINS_H_
