@@ -45,7 +45,7 @@ bool EncoderBase::IsMissingString(const std::string& s) const {
 
 bool EncoderBase::IsMissingNumber(double d) const {
   if (QZMV::IsMissing(d)) return true;
-  if (missingNumbers_.count(Key(d)) != 0) return true;
+  if (!missingNumbers_.empty() && missingNumbers_.count(Key(d)) != 0) return true;
   return hasRange_ && rangeLow_ <= d && d <= rangeHigh_;
 }
 

@@ -41,6 +41,7 @@ ValueRecord::ValueRecord(size_t capacity) {
     layout->index.reserve(capacity);
     values_.reserve(capacity);
     layout_ = std::move(layout);
+    layoutId_ = layout_->id;
   } catch (...) {
     // values_ reserves last: a failure leaves it untouched
   }
@@ -49,8 +50,10 @@ ValueRecord::ValueRecord(size_t capacity) {
 ValueRecord::ValueRecord(const ValueRecord& other) = default;
 
 ValueRecord::ValueRecord(ValueRecord&& other) noexcept
-    : layout_(std::move(other.layout_)), values_(std::move(other.values_)) {
+    : layout_(std::move(other.layout_)), values_(std::move(other.values_)),
+      layoutId_(other.layoutId_) {
   other.values_.clear();
+  other.layoutId_ = 0;
 }
 
 ValueRecord& ValueRecord::operator=(const ValueRecord& other) {
@@ -61,6 +64,7 @@ ValueRecord& ValueRecord::operator=(const ValueRecord& other) {
   }
   std::vector<Value> values(other.values_);
   layout_ = other.layout_;
+  layoutId_ = other.layoutId_;
   values_ = std::move(values);
   return *this;
 }
@@ -69,7 +73,9 @@ ValueRecord& ValueRecord::operator=(ValueRecord&& other) noexcept {
   if (this == &other) return *this;
   layout_ = std::move(other.layout_);
   values_ = std::move(other.values_);
+  layoutId_ = other.layoutId_;
   other.layout_.reset();
+  other.layoutId_ = 0;
   other.values_.clear();
   return *this;
 }
@@ -82,6 +88,7 @@ ValueRecord::Layout& ValueRecord::WritableLayout() {
   } else if (layout_.use_count() > 1) {
     layout_ = std::make_shared<Layout>(*layout_);
   }
+  layoutId_ = layout_->id;
   return *layout_;
 }
 
@@ -151,8 +158,6 @@ std::vector<std::string> ValueRecord::Names(bool all) const {
   }
   return names;
 }
-
-uint64_t ValueRecord::GetLayoutId() const noexcept { return layout_ ? layout_->id : 0; }
 
 void ValueRecord::ClearValues() noexcept {
   for (Value& value : values_) value = Value();

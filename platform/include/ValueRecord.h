@@ -69,7 +69,7 @@ class QZCOMMON_API ValueRecord {
   // Copies share the id until one of them adds a field; ids are never reused. 0 for a
   // record that never had a field. Lets a caller that cached field positions check a
   // record's layout with two comparisons instead of name lookups.
-  uint64_t GetLayoutId() const noexcept;
+  uint64_t GetLayoutId() const noexcept { return layoutId_; }
 
  private:
   struct Layout;
@@ -80,6 +80,7 @@ class QZCOMMON_API ValueRecord {
 
   std::shared_ptr<Layout> layout_;  // names and their index; shared between copies
   std::vector<Value> values_;       // one per name, same order
+  uint64_t layoutId_ = 0;           // layout_->id, or 0 without a layout (read per record)
 };
 
 }  // namespace QZCommon_800

@@ -174,6 +174,18 @@ std::unique_ptr<CompiledModel> DocumentContext::Compile(const xercesc::DOMElemen
   const xercesc::DOMElement* local = FirstChildElement(model, u"LocalTransformations");
   const bool hasLocal = FirstChildElement(local, u"DerivedField") != nullptr;
   const QZXML_800::QZVarList& modelScope = hasLocal ? NewScope(scope, local) : scope;
+  // Numeric local fields reach the segments as numbers (the engine stores a number or
+  // system-missing in them), so they need no validity check there. Not for a model
+  // chain: it hands later segments the earlier ones' outputs, which may reuse the name.
+  const xercesc::DOMElement* segmentation = FirstChildElement(model, u"Segmentation");
+  if (hasLocal && reader_.Attr(segmentation, u"multipleModelMethod") != "modelChain") {
+    for (const xercesc::DOMElement* derived : ChildElements(local, u"DerivedField")) {
+      const std::string type = reader_.Attr(derived, u"dataType");
+      if (type == "double" || type == "float" || type == "integer") {
+        compiled->schema_.AddComputedNumber(reader_.Attr(derived, u"name"));
+      }
+    }
+  }
 
   ModelContext context(*this, model, compiled->kind_, compiled->function_, target,
                        compiled->categories_, modelScope, compiled->fields_,
@@ -203,6 +215,7 @@ std::unique_ptr<CompiledModel> DocumentContext::Compile(const xercesc::DOMElemen
     }
   }
   compiled->copy_ = compiled->engine_ != nullptr || compiled->schema_.ChangesValues();
+  compiled->schema_.Finish(compiled->copy_);
   return compiled;
 }
 
@@ -236,7 +249,7 @@ const ModelResult& CompiledModel::Score(const ValueRecord& input) {
     record = &working_;
   }
   fields_.Bind(*record);
-  if (!schema_.Apply(*record, copy_ ? &working_ : nullptr, fields_)) {
+  if (schema_.HasChecks() && !schema_.Apply(*record, copy_ ? &working_ : nullptr, fields_)) {
     result_.state = ModelResult::kInvalid;
     result_.error = PLUGIN_INVALID_INPUT;
     return result_;

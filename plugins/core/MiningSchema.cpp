@@ -149,6 +149,13 @@ void MiningSchema::Compile(const xercesc::DOMElement* schema, DocumentContext& d
       binder.Add(name);
       continue;  // the enclosing model already refuses what this check would refuse
     }
+    // Any number passes a numeric field without Intervals, and any value passes a
+    // categorical one without declared categories; neither case can refuse a record.
+    field.noOpWithoutCopy =
+        defaults && field.invalidValues == nullptr &&
+        (field.numeric ? field.intervals.empty() && parent != nullptr &&
+                             parent->ComputesNumber(name)
+                       : field.categories == nullptr);
     changesValues_ = changesValues_ || field.hasReplacement ||
                      field.invalid == Invalid::kAsMissing || field.invalid == Invalid::kAsValue ||
                      field.outliers != Outliers::kAsIs;
@@ -162,6 +169,23 @@ bool MiningSchema::Guarantees(const std::string& field) const {
     if (name == field) return true;
   }
   return false;
+}
+
+bool MiningSchema::ComputesNumber(const std::string& field) const {
+  for (const std::string& name : computedNumbers_) {
+    if (name == field) return true;
+  }
+  return false;
+}
+
+void MiningSchema::Finish(bool working) {
+  if (working) return;
+  std::vector<Field> kept;
+  kept.reserve(fields_.size());
+  for (Field& field : fields_) {
+    if (!field.noOpWithoutCopy) kept.push_back(std::move(field));
+  }
+  fields_ = std::move(kept);
 }
 
 bool MiningSchema::IsMissing(const Field& field, const Value& value) const {

@@ -63,6 +63,17 @@ class MiningSchema {
   // outlier treatment): the model then scores a working copy of its input.
   bool ChangesValues() const { return changesValues_; }
 
+  // Declares a field the model computes (a LocalTransformations field of a numeric data
+  // type) into every record it hands its segments: such a record holds a number or
+  // system-missing there, which a segment need not check again.
+  void AddComputedNumber(const std::string& field) { computedNumbers_.push_back(field); }
+  bool ComputesNumber(const std::string& field) const;
+  // Called once the model knows whether it scores a working copy: without one, drops
+  // the checks that can neither refuse a record nor change a value.
+  void Finish(bool working);
+  // Whether Apply has anything to check; when not, calling it is a no-op.
+  bool HasChecks() const { return !fields_.empty(); }
+
   // Checks every active field of `record` (bound in `binder`) and, when `working` is the
   // same record as a writable copy, writes the treated values into it. Returns false
   // when the record is refused (returnInvalid). Allocates nothing for numeric work.
@@ -94,6 +105,9 @@ class MiningSchema {
     QZCommon_800::Value invalidReplacement;
     Outliers outliers = Outliers::kAsIs;
     double lowValue = 0.0, highValue = 0.0;
+    // Default treatment and every value it can see is valid or missing: without a
+    // working copy to normalise missing values in, the check does nothing.
+    bool noOpWithoutCopy = false;
   };
 
   static std::vector<Interval> ReadIntervals(const DocumentContext& document,
@@ -104,6 +118,7 @@ class MiningSchema {
   std::vector<Field> fields_;  // the active fields Apply checks
   std::vector<std::string> active_;
   std::vector<std::string> guaranteed_;
+  std::vector<std::string> computedNumbers_;
   std::string target_;
   bool changesValues_ = false;
 };

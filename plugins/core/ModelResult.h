@@ -3,6 +3,7 @@
 #ifndef QZPLUGIN_CORE_MODELRESULT_H_
 #define QZPLUGIN_CORE_MODELRESULT_H_
 
+#include <algorithm>
 #include <limits>
 #include <vector>
 
@@ -45,9 +46,13 @@ struct ModelResult {
     state = kMissing;
     value = std::numeric_limits<double>::quiet_NaN();
     category = -1;
-    probabilities.assign(static_cast<size_t>(categories), 0.0);
+    // Same size as last time (every record after the first): zero in place.
+    const size_t n = static_cast<size_t>(categories);
+    if (probabilities.size() != n) probabilities.resize(n);
+    std::fill(probabilities.begin(), probabilities.end(), 0.0);
     hasProbabilities = false;
-    confidences.assign(static_cast<size_t>(categories), 0.0);
+    if (confidences.size() != n) confidences.resize(n);
+    std::fill(confidences.begin(), confidences.end(), 0.0);
     hasConfidences = false;
     entityId = nullptr;
     standardError = std::numeric_limits<double>::quiet_NaN();

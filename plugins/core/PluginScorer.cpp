@@ -92,9 +92,12 @@ QZStatus PluginScorer::ScoreRecord(const ValueRecord& input, ValueRecord& output
       }
     }
   }
-  const QZStatus written = model.Output().Write(result, model.Prepared(input), output);
-  if (result.state == ModelResult::kInvalid) return QZStatus(result.error, false);
-  return written;
+  if (result.state == ModelResult::kInvalid) {
+    if (model.Output().Count() > 0) model.Output().Write(result, model.Prepared(input), output);
+    return QZStatus(result.error, false);
+  }
+  if (model.Output().Count() == 0) return QZStatus();  // no Output fields: nothing to write
+  return model.Output().Write(result, model.Prepared(input), output);
 }
 
 namespace {

@@ -64,9 +64,12 @@ void TargetStage::Compile(const xercesc::DOMElement* targets, const DomReader& r
       hasDisplay_[i] = true;
     }
   }
+  active_ = classification ? !priors_.empty()
+                           : hasDefault_ || hasMin_ || hasMax_ || factor_ != 1.0 ||
+                                 constant_ != 0.0 || cast_ != Cast::kNone;
 }
 
-void TargetStage::Finish(ModelResult& result) const {
+void TargetStage::Apply(ModelResult& result) const {
   if (classification_) {
     if (result.state == ModelResult::kMissing && !priors_.empty()) {
       for (size_t i = 0; i < result.probabilities.size(); ++i) {

@@ -30,14 +30,26 @@ class TargetStage {
                const std::string& targetField, bool classification,
                CategoryTable* categories);
 
-  // Applies the target's treatment to a result (see the class comment).
-  void Finish(ModelResult& result) const;
+  // Applies the target's treatment to a result (see the class comment). Without one
+  // (the usual case) only the identity rescaling's effect remains: x * 1 + 0 is x except
+  // that -0 becomes +0.
+  void Finish(ModelResult& result) const {
+    if (active_) {
+      Apply(result);
+    } else if (!classification_ && result.state == ModelResult::kValue) {
+      result.value += 0.0;
+    }
+  }
 
   // The displayValue of a category's TargetValue, null when it declares none.
   const std::string* DisplayValue(int category) const;
 
  private:
   enum class Cast { kNone, kRound, kCeiling, kFloor };
+
+  void Apply(ModelResult& result) const;
+
+  bool active_ = false;  // some treatment changes results (set by Compile)
 
   bool classification_ = false;
   bool hasMin_ = false, hasMax_ = false;
