@@ -3,10 +3,14 @@
 #ifndef QZ_TESTS_REFERENCE_PLUGINS_H_
 #define QZ_TESTS_REFERENCE_PLUGINS_H_
 
+#include <iostream>
 #include <memory>
 #include <sstream>
 #include <string>
 
+#include <gtest/gtest.h>
+
+#include "QZDisplay.h"
 #include "QZSettings.h"
 #include "ScoringFactory.h"
 #include "ScoringModel.h"
@@ -37,6 +41,19 @@ inline std::unique_ptr<QZScoring_800::ScoringModel> CreateModel(const std::strin
   if (status != nullptr) *status = factory.GetStatus().GetErrorCode();
   factory.Detach();
   return model;
+}
+
+// A plug-in refuses the document at creation: no model, status 260010, and a diagnostic
+// line that contains message.
+inline void ExpectRefused(const std::string& pmml, const std::string& message) {
+  std::ostringstream notes;
+  QZDisplay_800::SetDisplayStream(&notes);
+  long status = 0;
+  auto model = CreateModel(pmml, &status);
+  QZDisplay_800::SetDisplayStream(&std::cerr);
+  EXPECT_EQ(model, nullptr) << message;
+  EXPECT_EQ(status, 260010) << message;
+  EXPECT_NE(notes.str().find(message), std::string::npos) << notes.str();
 }
 
 }  // namespace qztest
