@@ -780,22 +780,24 @@ class Replace final : public ValueApply<Replace> {
   ExprPtr replacement_;
 };
 
-class FormatNumberFn final : public ValueApply<FormatNumberFn> {
+// The pattern argument of formatNumber and formatDatetime: a constant pattern is parsed
+// once at load (a malformed one is refused there), any other per record.
+template <class Format>
+class FormatPattern {
  public:
-  explicit FormatNumberFn(ApplySite& site)
-      : ValueApply(site, false), a_(std::move(site.args[0])), pattern_(std::move(site.args[1])) {
+  explicit FormatPattern(ExprPtr pattern) : pattern_(std::move(pattern)) {
     const ConstantExpr* constant = AsConstant(pattern_);
     if (constant == nullptr || constant->Get().IsMissing()) return;
     std::string why;
     if (!fixed_.Parse(constant->Get().GetString(), &why)) throw BuildError{kMalformed, why};
     isFixed_ = true;
   }
-  Outcome Compute(const EvalContext& ctx, Value& out) const {
-    const double x = a_->EvalReal(ctx);
-    Outcome o = IsInvalidReal(x) ? Outcome::kInvalid
-                                 : (IsMissingReal(x) ? Outcome::kMissingInput : Outcome::kOk);
-    NumberFormat parsed;
-    const NumberFormat* format = &fixed_;
+
+  // Writes what into out as the pattern says, given the outcome of computing what.
+  template <class T>
+  Outcome Apply(Outcome o, const T& what, const EvalContext& ctx, Value& out) const {
+    Format parsed;
+    const Format* format = &fixed_;
     if (!isFixed_) {
       Value scratch;
       std::string buffer;
@@ -808,16 +810,31 @@ class FormatNumberFn final : public ValueApply<FormatNumberFn> {
     }
     if (o != Outcome::kOk) return o;
     std::string result;
-    if (!format->Format(x, &result)) return Outcome::kInvalid;
+    if (!format->Format(what, &result)) return Outcome::kInvalid;
     out = std::move(result);
     return Outcome::kOk;
   }
 
  private:
-  ExprPtr a_;
   ExprPtr pattern_;
-  NumberFormat fixed_;
+  Format fixed_;
   bool isFixed_ = false;
+};
+
+class FormatNumberFn final : public ValueApply<FormatNumberFn> {
+ public:
+  explicit FormatNumberFn(ApplySite& site)
+      : ValueApply(site, false), a_(std::move(site.args[0])), pattern_(std::move(site.args[1])) {}
+  Outcome Compute(const EvalContext& ctx, Value& out) const {
+    const double x = a_->EvalReal(ctx);
+    const Outcome o = IsInvalidReal(x) ? Outcome::kInvalid
+                      : (IsMissingReal(x) ? Outcome::kMissingInput : Outcome::kOk);
+    return pattern_.Apply(o, x, ctx, out);
+  }
+
+ private:
+  ExprPtr a_;
+  FormatPattern<NumberFormat> pattern_;
 };
 
 // ---------------------------------------------------------------------------------
@@ -835,40 +852,16 @@ Outcome DateOf(const Expr& e, const EvalContext& ctx, DateTime* out) {
 class FormatDatetimeFn final : public ValueApply<FormatDatetimeFn> {
  public:
   explicit FormatDatetimeFn(ApplySite& site)
-      : ValueApply(site, false), a_(std::move(site.args[0])), pattern_(std::move(site.args[1])) {
-    const ConstantExpr* constant = AsConstant(pattern_);
-    if (constant == nullptr || constant->Get().IsMissing()) return;
-    std::string why;
-    if (!fixed_.Parse(constant->Get().GetString(), &why)) throw BuildError{kMalformed, why};
-    isFixed_ = true;
-  }
+      : ValueApply(site, false), a_(std::move(site.args[0])), pattern_(std::move(site.args[1])) {}
   Outcome Compute(const EvalContext& ctx, Value& out) const {
     DateTime when;
-    Outcome o = DateOf(*a_, ctx, &when);
-    DateFormat parsed;
-    const DateFormat* format = &fixed_;
-    if (!isFixed_) {
-      Value scratch;
-      std::string buffer;
-      std::string_view text;
-      std::string why;
-      o = Worse(o, TextOf(*pattern_, ctx, scratch, buffer, &text));
-      if (o != Outcome::kOk) return o;
-      if (!parsed.Parse(text, &why)) return Outcome::kInvalid;
-      format = &parsed;
-    }
-    if (o != Outcome::kOk) return o;
-    std::string result;
-    if (!format->Format(when, &result)) return Outcome::kInvalid;
-    out = std::move(result);
-    return Outcome::kOk;
+    const Outcome o = DateOf(*a_, ctx, &when);
+    return pattern_.Apply(o, when, ctx, out);
   }
 
  private:
   ExprPtr a_;
-  ExprPtr pattern_;
-  DateFormat fixed_;
-  bool isFixed_ = false;
+  FormatPattern<DateFormat> pattern_;
 };
 
 // dateDaysSinceYear, dateSecondsSinceYear, dateSecondsSinceMidnight.
