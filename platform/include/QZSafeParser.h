@@ -9,7 +9,9 @@
 //    resolver that throws), disables the default entity resolution, never loads an
 //    external DTD, never validates and never processes or loads schemas;
 //  - limits entity expansion to kQZEntityExpansionLimit and element nesting to a depth
-//    (kQZDefaultMaxElementDepth unless the constructor is told otherwise);
+//    (kQZDefaultMaxElementDepth unless the constructor is told otherwise), and refuses
+//    an element with more than kQZMaxAttributes attributes or an attribute value longer
+//    than kQZMaxAttributeLength;
 //  - treats errors and fatal errors as failures by throwing, so that a truncated tree
 //    or a partly delivered event stream is never taken for a whole document.
 //
@@ -40,6 +42,12 @@ constexpr unsigned kQZDefaultMaxElementDepth = 1000;
 // Entity expansions a parser allows per document (only the five predefined entities
 // can occur at all, since no DOCTYPE is accepted).
 constexpr unsigned kQZEntityExpansionLimit = 100;
+// Most attributes one element may carry, and the longest attribute value (in UTF-16 code
+// units). PMML needs a few dozen short attributes; the DOM adds an element's attributes
+// in time that grows with the square of their number, and every reading step copies a
+// value, so larger ones only serve to exhaust time or memory.
+constexpr unsigned kQZMaxAttributes = 100;
+constexpr unsigned kQZMaxAttributeLength = 1u << 20;
 
 // The text of a Xerces-C++ string as UTF-8, whatever the locale; empty for a null
 // pointer or when the text cannot be transcoded. Never throws.
@@ -85,8 +93,9 @@ class QZPARSEXML_API QZSafeDOMParser : public xercesc::XercesDOMParser {
   // The nesting limit given at construction.
   unsigned GetMaxElementDepth() const { return maxDepth_; }
 
-  // Scanner events, overridden to count the element depth; they throw a
-  // SAXParseException when the nesting goes deeper than the limit.
+  // Scanner events, overridden to count the element depth and check the attributes;
+  // they throw a SAXParseException when the nesting goes deeper than the limit or the
+  // attributes are too many or too long.
   void startDocument() override;
   void startElement(const xercesc::XMLElementDecl& elemDecl, const unsigned int urlId,
                     const XMLCh* const elemPrefix,
@@ -119,7 +128,8 @@ class QZPARSEXML_API QZSafeSAX2Handler : public xercesc::DefaultHandler {
   QZSafeSAX2Handler(const QZSafeSAX2Handler&) = delete;
   QZSafeSAX2Handler& operator=(const QZSafeSAX2Handler&) = delete;
 
-  // Counting the depth (startDocument resets it, a parse may have been broken off).
+  // Counting the depth (startDocument resets it, a parse may have been broken off);
+  // startElement also refuses attributes that are too many or too long.
   void startDocument() override;
   void startElement(const XMLCh* const uri, const XMLCh* const localname,
                     const XMLCh* const qname, const xercesc::Attributes& attrs) override;

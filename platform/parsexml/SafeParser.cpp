@@ -9,12 +9,14 @@
 #include <xercesc/internal/XMLScanner.hpp>
 #include <xercesc/sax/ErrorHandler.hpp>
 #include <xercesc/sax/SAXParseException.hpp>
+#include <xercesc/sax2/Attributes.hpp>
 #include <xercesc/sax2/XMLReaderFactory.hpp>
 #include <xercesc/util/OutOfMemoryException.hpp>
 #include <xercesc/util/TransService.hpp>
 #include <xercesc/util/XMLEntityResolver.hpp>
 #include <xercesc/util/XMLException.hpp>
 #include <xercesc/util/XMLResourceIdentifier.hpp>
+#include <xercesc/util/XMLString.hpp>
 #include <xercesc/util/XMLUni.hpp>
 
 #include "QZXInputSource.h"
@@ -44,6 +46,22 @@ class Utf16 {
 
 std::string DepthMessage(unsigned limit) {
   return "elements nested deeper than " + std::to_string(limit) + " levels";
+}
+
+// Why an element's attributes are refused (too many, or a value too long); empty when
+// they are acceptable. valueAt(i) is the value of attribute i.
+template <class ValueAt>
+std::string AttributeProblem(XMLSize_t count, ValueAt valueAt) {
+  if (count > kQZMaxAttributes) {
+    return "an element with more than " + std::to_string(kQZMaxAttributes) + " attributes";
+  }
+  for (XMLSize_t i = 0; i < count; ++i) {
+    if (xc::XMLString::stringLen(valueAt(i)) > kQZMaxAttributeLength) {
+      return "an attribute value longer than " + std::to_string(kQZMaxAttributeLength) +
+             " characters";
+    }
+  }
+  return std::string();
 }
 
 std::string EntityMessage(const XMLCh* systemId, const XMLCh* publicId) {
@@ -206,6 +224,9 @@ void QZSafeDOMParser::startElement(const xc::XMLElementDecl& elemDecl,
                                    const bool isRoot) {
   const unsigned mine = ++depth_;
   if (mine > maxDepth_) ThrowRefusal(DepthMessage(maxDepth_), getScanner()->getLocator());
+  const std::string problem = AttributeProblem(
+      attrCount, [&attrList](XMLSize_t i) { return attrList.elementAt(i)->getValue(); });
+  if (!problem.empty()) ThrowRefusal(problem, getScanner()->getLocator());
   XercesDOMParser::startElement(elemDecl, urlId, elemPrefix, attrList, attrCount, isEmpty,
                                 isRoot);
   // An empty element gets no separate end event from the scanner; whether the base
@@ -232,8 +253,11 @@ QZSafeSAX2Handler::~QZSafeSAX2Handler() = default;
 void QZSafeSAX2Handler::startDocument() { depth_ = 0; }
 
 void QZSafeSAX2Handler::startElement(const XMLCh* const, const XMLCh* const,
-                                     const XMLCh* const, const xc::Attributes&) {
+                                     const XMLCh* const, const xc::Attributes& attrs) {
   EnterElement();
+  const std::string problem =
+      AttributeProblem(attrs.getLength(), [&attrs](XMLSize_t i) { return attrs.getValue(i); });
+  if (!problem.empty()) Refuse(problem);
 }
 
 void QZSafeSAX2Handler::endElement(const XMLCh* const, const XMLCh* const,

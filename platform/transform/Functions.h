@@ -76,6 +76,8 @@ struct Function {
   std::vector<std::pair<const Function*, int>> calls;
   int ownDepth = 0;
   int depth = 0;  // nesting depth of an evaluation, through the calls
+  uint64_t ownSteps = 0;  // nodes of the body
+  uint64_t steps = 0;     // nodes one call visits at most, through the calls
 };
 
 // The base of every Apply node: the function's name (for messages) and the options, and

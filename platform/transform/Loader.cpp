@@ -217,6 +217,7 @@ class Compiler {
   std::vector<std::pair<const Function*, int>>& calls() { return calls_; }
   int depth() const { return depth_; }
   int maxDepth() const { return maxDepth_; }
+  uint64_t steps() const { return steps_; }
 
  private:
   Program& program_;
@@ -228,6 +229,7 @@ class Compiler {
   std::vector<std::pair<const Function*, int>> calls_;
   int depth_ = 0;
   int maxDepth_ = 0;
+  uint64_t steps_ = 0;  // expression nodes compiled
 };
 
 ExprPtr CompileConstant(Compiler& c, const xc::DOMElement& element) {
@@ -510,6 +512,7 @@ const std::unordered_map<std::string, ElementCompiler>& ExpressionElements() {
 ExprPtr Compiler::Compile(const xc::DOMElement& element) {
   const ElementCompiler compile = FindElementCompiler(*this, element, ++depth_);
   maxDepth_ = std::max(maxDepth_, depth_);
+  ++steps_;
   ExprPtr expr = compile(*this, element);
   --depth_;
   return expr;
@@ -557,6 +560,7 @@ std::shared_ptr<DerivedField> CompileDerivedField(const xc::DOMElement& element,
   field->uses = typed.uses();
   field->calls = std::move(typed.calls());
   field->ownDepth = typed.maxDepth();
+  field->ownSteps = typed.steps();
   return field;
 }
 
@@ -597,6 +601,7 @@ void CompileBody(const xc::DOMElement& element, Function& function, const LoadSc
   function.body = c.Compile(*TheExpression(c, element, "ParameterField"));
   function.calls = std::move(c.calls());
   function.ownDepth = c.maxDepth();
+  function.ownSteps = c.steps();
 }
 
 // The nesting depth of an evaluation through calls: own depth, or a call's depth plus
@@ -605,6 +610,22 @@ int TotalDepth(int ownDepth, const std::vector<std::pair<const Function*, int>>&
   int depth = ownDepth;
   for (const auto& call : calls) depth = std::max(depth, call.second + call.first->depth);
   return depth;
+}
+
+// The nodes one evaluation visits at most: its own, and the callee's for every call site.
+// Stops counting just past the limit, so that the sum cannot overflow.
+uint64_t TotalSteps(uint64_t ownSteps, const std::vector<std::pair<const Function*, int>>& calls) {
+  uint64_t steps = ownSteps;
+  for (const auto& call : calls) {
+    steps += call.first->steps;
+    if (steps > kMaxEvaluationSteps) return kMaxEvaluationSteps + 1;
+  }
+  return steps;
+}
+
+std::string StepsText() {
+  return "evaluating it takes more than " + std::to_string(kMaxEvaluationSteps) +
+         " steps, counting the calls of functions";
 }
 
 // Refuses calls between the new functions that form a cycle, then gives each its total
@@ -651,6 +672,10 @@ void CheckFunctions(const std::vector<std::shared_ptr<Function>>& functions) {
                                           "': expressions are nested deeper than " +
                                           std::to_string(kMaxExpressionDepth) +
                                           " levels, counting the calls of functions"};
+        }
+        f.steps = TotalSteps(f.ownSteps, f.calls);
+        if (f.steps > kMaxEvaluationSteps) {
+          throw LoadError{kMalformed, "DefineFunction '" + f.name + "': " + StepsText()};
         }
         state[top.function] = kDone;
         stack.pop_back();
@@ -762,7 +787,17 @@ void CompileTransformations(const xc::DOMElement& root, Program& program) {
                                       std::to_string(kMaxExpressionDepth) +
                                       " levels, counting the calls of functions"};
     }
+    field->steps = TotalSteps(field->ownSteps, field->calls);
     program.AddField(std::move(field));
+  }
+  // Transform evaluates every field once a record: the bound holds for all of them.
+  uint64_t steps = 0;
+  for (const auto& field : program.Fields()) {
+    steps += field->steps;
+    if (steps > kMaxEvaluationSteps) {
+      throw LoadError{kMalformed, "DerivedField '" + field->name + "': with the fields before it, " +
+                                      StepsText()};
+    }
   }
 
   // References can be checked only once every field is known (any document order).

@@ -20,6 +20,11 @@ namespace internal {
 // functions: evaluation recurses once per level, so this bounds the stack it needs
 // (a few hundred bytes a level) far below any thread's stack.
 constexpr int kMaxExpressionDepth = 250;
+// Most expression nodes one record may evaluate, counted through calls of user-defined
+// functions (every call site evaluates the callee's body again), over all loaded derived
+// fields. Functions that call others twice would otherwise double the work per level and
+// hang Transform on a document of a few kilobytes.
+constexpr uint64_t kMaxEvaluationSteps = 10000000;
 
 // A field an expression reads, and the element that reads it (for messages).
 struct FieldUse {
@@ -39,6 +44,8 @@ struct DerivedField {
   std::vector<FieldUse> uses;  // every field the expression reads
   std::vector<std::pair<const Function*, int>> calls;  // user functions, at their depth
   int ownDepth = 0;
+  uint64_t ownSteps = 0;  // nodes of its own expression
+  uint64_t steps = 0;     // nodes one evaluation visits at most, through the calls
 };
 
 // What a loaded document declares about one of its input fields (a DataField).

@@ -4,6 +4,7 @@
 // the predicate unknown) or 0 (missing input makes it true).
 
 #include <algorithm>
+#include <cmath>
 #include <limits>
 #include <memory>
 #include <string>
@@ -420,8 +421,10 @@ void ScoringPMMLParser::GetScaleSplitValue(const XMLCh* value, const XMLCh* op, 
       throw ScoringException(ScoringException::SCORING_EXC_INVALID_RANGE,
                              "value attribute is required for operator " + ToString(op));
     }
+    // A number too large for a double (1e400) reads as infinity. Infinite range ends are
+    // open, so x < 1e400 would hold for no number: such comparisons are refused.
     double number = 0.0;
-    if (!ParseDouble(value, number)) {
+    if (!ParseDouble(value, number) || !std::isfinite(number)) {
       throw ScoringException(ScoringException::SCORING_EXC_INVALID_RANGE,
                              "Invalid split value: " + ToString(value));
     }
