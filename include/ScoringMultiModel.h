@@ -34,8 +34,9 @@ class QZSCORING_API ScoringMultiModel : public ScoringAbsModel {
   ScoringModel* Clone() const override;
   // Scores the input record with every sub-model in insertion order (each into a record
   // with the output record's fields) and sets output[N][M] for every field N the
-  // sub-model named M wrote. A failing sub-model contributes nothing and its status is
-  // dropped. 260009 without sub-models; success otherwise. Never throws.
+  // sub-model named M wrote. A failing sub-model (its scorer may even have thrown)
+  // contributes nothing and its status is dropped. 260009 without sub-models; success
+  // otherwise. Never throws.
   QZCommon_800::QZStatus Score(QZCommon_800::ValueRecord& input,
                                QZCommon_800::ValueRecord& output) override;
   // Lays out record[N][M] for every field N that the sub-model named M produces.

@@ -29,8 +29,8 @@ namespace QZScoring_800 {
 // parser right after use. The library first offers the document as a stream; when that
 // gives null, it parses the document and offers the model element. Each operation
 // returns a new scorer owned by the caller, or null when the plug-in cannot score the
-// document. The slot order (destructor, CreateFromElement, CreateFromStream) is part of
-// the contract.
+// document; an exception thrown by the entry point or the parser counts as null. The
+// slot order (destructor, CreateFromElement, CreateFromStream) is part of the contract.
 class QZSCORING_API ScoringScoreParser {
  public:
   virtual ~ScoringScoreParser();

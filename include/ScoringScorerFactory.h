@@ -55,7 +55,8 @@ class QZSCORING_API ScoringScorerFactory {
 
   // The dispatcher: picks the plug-in for "scoring_modelType" (or the "Veritor" entry
   // when the type has no entry or "scoring_version" is neither "versionSupported",
-  // default "4.0", nor "4.1"), offers it the stream, then the parsed model element.
+  // default "4.0", nor "4.1"), offers it the stream, then (when that gives null or
+  // throws) the parsed model element.
   // Returns a new scorer owned by the caller, or null when none could be obtained.
   static QZCommon_800::IQZScore* GetScorer(QZXML_800::QZSettings& settings,
                                            QZXML_800::QZVarList& variables,

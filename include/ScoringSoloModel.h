@@ -39,14 +39,19 @@ class QZSCORING_API ScoringSoloModel : public ScoringAbsModel {
   // fields or NeedDerivedPredictor), scores it into output, then computes the
   // propensity fields that output contains (their failures are not reported).
   // 260009 without a scorer (records untouched); otherwise the engine's code when the
-  // transformation fails (the scorer is not called), or the scorer's status. An
-  // exception from the scorer or the engine gives 260099. Never throws.
+  // transformation fails (the scorer is not called), or the scorer's status unchanged.
+  // A field the scorer writes without having declared it in Scorable is appended to
+  // output after the declared ones; the propensity fields are found by name, so they
+  // are still computed. 260029 when the scorer throws (output may hold what it wrote
+  // before), 260099 when the engine or the library itself throws. Never throws.
   QZCommon_800::QZStatus Score(QZCommon_800::ValueRecord& input,
                                QZCommon_800::ValueRecord& output) override;
   // The scorer's Scorable; when it succeeds, the record has "prediction" and
   // "probability" and the model has an adjusted propensity, appends "rawpropensity"
   // and, when the network was read, "adjustedpropensity". 260009 without a scorer;
-  // 260099 when the scorer throws. Never throws.
+  // 260029 when the scorer throws (no propensity field is added). Never throws.
+  // The model never asks the scorer's IsReady: that answer is for the host (through
+  // GetScorer); a scorer that is not ready is called like any other.
   QZCommon_800::QZStatus Scorable(QZCommon_800::ValueRecord& record) override;
   // The scorer's type text; "UNKNOWN" without a scorer (or when the scorer throws).
   std::string GetModelType() const override;

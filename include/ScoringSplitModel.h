@@ -52,13 +52,13 @@ class QZSCORING_API ScoringSplitModel : public ScoringAbsModel {
   // Null: a split model cannot be copied.
   ScoringModel* Clone() const override;
   // Clears the output record's values, then scores the input record with the sub-model
-  // whose key equals the record's split-field values and returns its status. The
-  // split-field positions are looked up on the first call and again whenever the
-  // input record's layout changes. After Scorable has seen a sub-model with several
-  // targets, the output of a sub-model with one target T is nested: each non-null field
-  // N becomes a structured value whose entry T holds N's value. 260009 without
-  // sub-models or when no key matches; 260027 when a split field is not a field of the
-  // input record. Never throws.
+  // whose key equals the record's split-field values and returns its status (260029
+  // when that sub-model's scorer threw). The split-field positions are looked up on
+  // the first call and again whenever the input record's layout changes. After
+  // Scorable has seen a sub-model with several targets, the output of a sub-model with
+  // one target T is nested: each non-null field N becomes a structured value whose
+  // entry T holds N's value. 260009 without sub-models or when no key matches; 260027
+  // when a split field is not a field of the input record. Never throws.
   QZCommon_800::QZStatus Score(QZCommon_800::ValueRecord& input,
                                QZCommon_800::ValueRecord& output) override;
   // Lays out the first sub-model's output fields and records, for every sub-model,

@@ -27,7 +27,8 @@ constexpr long SCORING_NO_RAW_PROPENSITY = 260017;      // the raw propensity ca
 constexpr long SCORING_NETWORK_SIZE_MISMATCH = 260023;  // network weight and bias arrays differ in length
 constexpr long SCORING_SPLIT_FIELD_MISSING = 260027;    // a split field is not a field of the input record
 constexpr long SCORING_NO_MODEL_IDS = 260028;           // no "scoring_modelIDs" and not exactly one stream
-// An operation a host called failed unexpectedly inside the library or a plug-in (an
+constexpr long SCORING_SCORER_EXCEPTION = 260029;       // the model's scorer (a plug-in) threw from Score or Scorable
+// An operation a host called failed unexpectedly inside the library itself (an
 // exception such as memory exhaustion); nothing of it escapes to the host.
 constexpr long SCORING_INTERNAL_ERROR = 260099;
 

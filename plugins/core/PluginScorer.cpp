@@ -46,7 +46,7 @@ QZStatus PluginScorer::Scorable(ValueRecord& record) {
     document_->Root().Output().Declare(record);
     return QZStatus();
   } catch (...) {
-    return QZStatus(QZScoring_800::SCORING_INTERNAL_ERROR, false);
+    return QZStatus(QZScoring_800::SCORING_SCORER_EXCEPTION, false);
   }
 }
 
@@ -54,7 +54,7 @@ QZStatus PluginScorer::Score(const ValueRecord& input, ValueRecord& output) {
   try {
     return ScoreRecord(input, output);
   } catch (...) {
-    return QZStatus(QZScoring_800::SCORING_INTERNAL_ERROR, false);
+    return QZStatus(QZScoring_800::SCORING_SCORER_EXCEPTION, false);
   }
 }
 

@@ -20,7 +20,7 @@ namespace QZPlugin_800 {
 // model, named as the document names it. Score writes them by position (the output
 // layout is learnt once per layout). A record refused under returnInvalid leaves them
 // null and returns PLUGIN_INVALID_INPUT (or the transformation engine's code); an
-// unexpected failure returns SCORING_INTERNAL_ERROR. Nothing throws. One thread at a
+// unexpected failure returns SCORING_SCORER_EXCEPTION. Nothing throws. One thread at a
 // time; scorers share nothing.
 class PluginScorer : public QZScoring_800::ScoringBaseScorer {
  public:

@@ -3,6 +3,7 @@
 
 #include "ScoringScorerFactory.h"
 
+#include <exception>
 #include <memory>
 #include <utility>
 
@@ -60,9 +61,14 @@ IQZScore* AttemptWithPlugin(const std::string& baseName, Create create) {
     std::unique_ptr<ScoringScoreParser> parser(entry());
     if (!parser) return nullptr;
     return create(*parser);
+  } catch (const std::exception& e) {
+    TraceLog("scoring.log", 2, "  Exception:Function:%s; Line:%s",
+             "QZScoring_800::ScoringScorerFactory::GetScorer", e.what());
   } catch (...) {
-    return nullptr;
+    TraceLog("scoring.log", 2, "  Exception:Function:%s; Line:%s",
+             "QZScoring_800::ScoringScorerFactory::GetScorer", "unknown");
   }
+  return nullptr;
 }
 
 }  // namespace

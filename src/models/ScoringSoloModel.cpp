@@ -58,15 +58,25 @@ QZStatus ScoringSoloModel::ScoreUnguarded(ValueRecord& input, ValueRecord& outpu
     }
   }
 
-  if (status.IsOK()) status = fScorer->Score(input, output);
+  // The scorer is a plug-in's code: its exception is told apart from the library's.
+  if (status.IsOK()) {
+    status = GuardScorerCall("QZScoring_800::ScoringSoloModel::Score",
+                             [&] { return fScorer->Score(input, output); });
+  }
 
-  // A propensity that cannot be computed leaves its field as it was; scoring itself
-  // succeeded, so its status stands.
+  // A propensity that cannot be computed for this record is missing, never the one of
+  // the record before; scoring itself succeeded, so its status stands.
   const ScoringAdjustedPropensity* propensity = GetAdjustedPropensity();
   if (status.IsOK() && propensity != nullptr) {
-    if (output.Contains(fields::kAdjustedPropensity)) {
-      propensity->ComputeAdjustedPropensity(output);
-    } else if (output.Contains(fields::kRawPropensity)) {
+    for (const std::string* name : {&fields::kRawPropensity, &fields::kAdjustedPropensity}) {
+      const int index = output.IndexOf(*name);
+      if (index >= 0) output[static_cast<size_t>(index)] = Value::NULL_VALUE;
+    }
+    // The raw propensity does not need the network: it is computed even when the
+    // adjusted one cannot be.
+    const bool adjusted = output.Contains(fields::kAdjustedPropensity) &&
+                          propensity->ComputeAdjustedPropensity(output).IsOK();
+    if (!adjusted && output.Contains(fields::kRawPropensity)) {
       propensity->ComputeRawPropensity(output);
     }
   }
@@ -80,7 +90,8 @@ QZStatus ScoringSoloModel::Scorable(ValueRecord& record) {
 
 QZStatus ScoringSoloModel::ScorableUnguarded(ValueRecord& record) {
   if (!fScorer) return QZStatus(SCORING_NO_SCORER, false);
-  QZStatus status = fScorer->Scorable(record);
+  const QZStatus status = GuardScorerCall("QZScoring_800::ScoringSoloModel::Scorable",
+                                          [&] { return fScorer->Scorable(record); });
   const ScoringAdjustedPropensity* propensity = GetAdjustedPropensity();
   if (status.IsOK() && propensity != nullptr && record.Contains(fields::kPrediction) &&
       record.Contains(fields::kProbability)) {

@@ -123,7 +123,7 @@ ValueRecord Record(std::initializer_list<std::pair<const char*, Value>> fields) 
 }
 
 // Without a scorer nothing happens; a scorer is taken once; its failures pass through
-// unchanged and add no propensity field; a scorer that throws gives 260009.
+// unchanged and add no propensity field; a scorer that throws gives 260029.
 TEST(SoloModel, ScorerAndItsFailures) {
   ScoringSoloModel model{QZSettings(), QZVarList()};
   ValueRecord in = Record({{"x", 1.0}}), out;
@@ -147,7 +147,7 @@ TEST(SoloModel, ScorerAndItsFailures) {
   EXPECT_EQ(failing->Score(in, out).GetErrorCode(), 4711);
   // A scorer that throws: the exception becomes a status, never reaches the host.
   EXPECT_EQ(Solo(new FixedScorer("yes", 0.8, 0, true))->Score(in, out).GetErrorCode(),
-            QZScoring_800::SCORING_INTERNAL_ERROR);
+            QZScoring_800::SCORING_SCORER_EXCEPTION);
 }
 
 // Derived-field names are appended to the input once; Transform runs on every call.
@@ -211,7 +211,8 @@ TEST(SoloModel, PropensityFields) {
   EXPECT_FALSE(rawOnly.Contains("adjustedpropensity"));
 
   // An unread network: the layout gets "rawpropensity" alone, and a host record with
-  // "adjustedpropensity" keeps both fields as they were while Score succeeds.
+  // "adjustedpropensity" gets the raw propensity and a missing adjusted one (never what
+  // the field held before) while Score succeeds.
   auto unread = Solo(new FixedScorer("no", 0.8), FlagTarget());
   unread->SetAdjustedPropensity(Unread(*unread));
   out = ValueRecord();
@@ -219,8 +220,8 @@ TEST(SoloModel, PropensityFields) {
   EXPECT_EQ(out.Size(), 3u);
   ValueRecord both = Record({{"rawpropensity", -1.0}, {"adjustedpropensity", -1.0}});
   ASSERT_TRUE(unread->Score(in, both).IsOK());
-  EXPECT_EQ(both.Get("rawpropensity").GetReal(), -1.0);
-  EXPECT_EQ(both.Get("adjustedpropensity").GetReal(), -1.0);
+  EXPECT_DOUBLE_EQ(both.Get("rawpropensity").GetReal(), 0.2);
+  EXPECT_TRUE(both.Get("adjustedpropensity").IsMissing());
 }
 
 // Raw propensity: p for the true category, 1 - p otherwise; 260017 whenever the

@@ -12,9 +12,16 @@
 //   PLUGIN_ECHO         the stream attempt gives a scorer whose "prediction" is the name
 //                       of the document's target and whose "probability" echoes the
 //                       document's first input field; 78 when that field is missing
+//   PLUGIN_FAULTS       a faulty plug-in steered by model settings read at each call:
+//                       "test_parser_fault" at creation ("stream-throws": the stream
+//                       attempt consumes the stream and throws, the element attempt
+//                       succeeds; "both-throw"), "test_fault" at each scorer call (see
+//                       FaultyScorer)
+//   PLUGIN_ENTRY_THROWS the entry point throws
 // The scorer's type text tells the test which attempt made it and what it saw.
 
 #include <iterator>
+#include <limits>
 #include <stdexcept>
 #include <string>
 
@@ -101,9 +108,62 @@ class TargetEchoScorer : public IQZScore {
   std::string input_;
 };
 
+#if defined(PLUGIN_FAULTS)
+// Declares "prediction" and "probability" and scores "Y" with probability "x" / 10, unless
+// the model setting "test_fault" (read at each call) names a fault:
+//   score-throws, score-throws-other   Score throws a std::runtime_error, or an int
+//   scorable-throws                    Scorable throws after declaring "prediction"
+//   status                             Scorable gives 261777, Score 261778 (own codes)
+//   undeclared                         Score also writes "extra" and "note", never declared
+//   not-ready                          IsReady is false; the calls work as usual
+class FaultyScorer : public IQZScore {
+ public:
+  FaultyScorer(QZXML_800::QZSettings& settings, std::string type)
+      : settings_(settings), type_(std::move(type)) {}
+  bool IsReady() const override { return Fault() != "not-ready"; }
+  QZStatus Scorable(ValueRecord& record) override {
+    const std::string fault = Fault();
+    record.Add("prediction", Value());
+    if (fault == "scorable-throws") throw std::runtime_error("scorable fault");
+    record.Add("probability", Value());
+    return fault == "status" ? QZStatus(261777, false) : QZStatus();
+  }
+  QZStatus Score(const ValueRecord& input, ValueRecord& output) override {
+    const std::string fault = Fault();
+    output["prediction"] = "Y";
+    if (fault == "score-throws") throw std::runtime_error("score fault");
+    if (fault == "score-throws-other") throw 7;
+    if (fault == "status") return QZStatus(261778, false);
+    output["probability"] = input.Get("x").GetReal() / 10;
+    if (fault == "undeclared") {
+      output["extra"] = input.Get("x").GetReal() + 1;
+      output["note"] = "undeclared";
+    }
+    return QZStatus();
+  }
+  std::string GetType() const override { return type_; }
+
+ private:
+  std::string Fault() const {
+    std::string fault;
+    settings_.GetSettingValByName("test_fault", fault);
+    return fault;
+  }
+
+  QZXML_800::QZSettings& settings_;
+  std::string type_;
+};
+
+std::string ParserFault(const QZXML_800::QZSettings& settings) {
+  std::string fault;
+  settings.GetSettingValByName("test_parser_fault", fault);
+  return fault;
+}
+#endif
+
 class TestParser : public QZScoring_800::ScoringScoreParser {
  public:
-  IQZScore* CreateFromElement(QZXML_800::QZSettings&, QZXML_800::QZVarList&,
+  IQZScore* CreateFromElement(QZXML_800::QZSettings& settings, QZXML_800::QZVarList&,
                               xercesc::DOMDocument* document,
                               xercesc::DOMElement* element) override {
 #if defined(PLUGIN_THROWS)
@@ -111,6 +171,12 @@ class TestParser : public QZScoring_800::ScoringScoreParser {
 #endif
     if (document == nullptr || element == nullptr) return nullptr;
     QZScoring_800::ScoringStr name(element->getTagName());
+#if defined(PLUGIN_FAULTS)
+    if (ParserFault(settings) == "both-throw") throw std::runtime_error("element");
+    return new FaultyScorer(settings, "element:" + name.toUTF8());
+#else
+    (void)settings;
+#endif
     return new EchoScorer("element:" + name.toUTF8());
   }
 
@@ -121,6 +187,11 @@ class TestParser : public QZScoring_800::ScoringScoreParser {
 #endif
 #if defined(PLUGIN_ECHO)
     return new TargetEchoScorer(variables);
+#endif
+#if defined(PLUGIN_FAULTS)
+    if (ParserFault(settings).empty()) return new FaultyScorer(settings, "FAULTY");
+    pmml.ignore(std::numeric_limits<std::streamsize>::max());
+    throw std::runtime_error("stream");
 #endif
     (void)settings;
 #if defined(PLUGIN_THROWS)
@@ -143,6 +214,8 @@ class TestParser : public QZScoring_800::ScoringScoreParser {
 QZSCORING_PLUGIN_EXPORT QZScoring_800::ScoringScoreParser* GetScoreParser() {
 #if defined(PLUGIN_NULL_PARSER)
   return nullptr;
+#elif defined(PLUGIN_ENTRY_THROWS)
+  throw std::runtime_error("no parser today");
 #else
   return new TestParser();
 #endif
