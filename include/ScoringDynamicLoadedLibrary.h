@@ -42,8 +42,9 @@ class QZSCORING_API ScoringDynamicLoadedLibrary {
 
  private:
   void* fModule;
-  int fOption;
-  int fReserved;
+  // Kept for the object's binary layout; nothing reads them.
+  [[maybe_unused]] int fOption;
+  [[maybe_unused]] int fReserved;
   std::string fLibraryName;
   std::string fErrorString;
 };

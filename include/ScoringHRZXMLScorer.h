@@ -50,8 +50,9 @@ class QZSCORING_API ScoringHRZXMLScorer : public QZCommon_800::IQZScore {
   std::string GetType() const override;
 
  private:
-  const QZXML_800::QZSettings* fSettings;
-  QZXML_800::QZVarList* fVarList;
+  // Kept as given for the object's binary layout; scoring reads neither.
+  [[maybe_unused]] const QZXML_800::QZSettings* fSettings;
+  [[maybe_unused]] QZXML_800::QZVarList* fVarList;
   std::string fModelType;
 };
 

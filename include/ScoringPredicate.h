@@ -29,8 +29,9 @@ class QZSCORING_API ScoringPredicate {
     TRUE_PREDICATE = 3,
     FALSE_PREDICATE = 4
   };
-  // PMML's booleanOperator of a compound predicate.
-  enum CompoundBoolOperator { BOOL_OR = 0, BOOL_AND = 1, BOOL_XOR = 2, BOOL_SURROGATE = 3 };
+  // PMML's booleanOperator of a compound predicate. Based on int so that any int
+  // converts to it (a compound predicate accepts any value; see SetBoolOperator).
+  enum CompoundBoolOperator : int { BOOL_OR = 0, BOOL_AND = 1, BOOL_XOR = 2, BOOL_SURROGATE = 3 };
 
   ScoringPredicate() = default;
   virtual ~ScoringPredicate();

@@ -43,8 +43,9 @@ class QZSCORING_API ScoringTransformationsScorer : public QZCommon_800::IQZScore
   std::string GetType() const override;
 
  private:
-  const QZXML_800::QZSettings* fSettings;
-  const QZXML_800::QZVarList* fVarList;
+  // Kept as given for the object's binary layout; scoring reads neither.
+  [[maybe_unused]] const QZXML_800::QZSettings* fSettings;
+  [[maybe_unused]] const QZXML_800::QZVarList* fVarList;
   std::vector<std::string> fNames;
 };
 

@@ -44,6 +44,17 @@ inline XMLSize_t Utf8SequenceLength(XMLByte lead) {
   return 1;
 }
 
+// The length of the longest prefix of `bytes` without a byte from 0xF5 to 0xFF. No
+// such byte occurs in UTF-8, and Xerces-C++'s UTF-8 transcoder does not always refuse
+// one: once a step has produced more than 32 units, it skips a sequence led by 0xF5 to
+// 0xF7 (a value beyond U+10FFFF) without a word and goes on after it.
+inline XMLSize_t Utf8CandidateLength(const XMLByte* bytes, XMLSize_t size) {
+  for (XMLSize_t i = 0; i < size; ++i) {
+    if (bytes[i] >= 0xF5) return i;
+  }
+  return size;
+}
+
 // Appends `text` (size units) converted by `transcoder` to `out`. A transcoder that
 // throws loses the whole step it was working on, so the failing step is redone one
 // character at a time to keep every byte before the character it refuses.
@@ -77,6 +88,7 @@ inline void EncodeInSteps(XERCES_CPP_NAMESPACE::XMLTranscoder& transcoder,
 // incomplete sequence at the end is dropped.
 inline void DecodeInSteps(XERCES_CPP_NAMESPACE::XMLTranscoder& transcoder,
                           const XMLByte* bytes, XMLSize_t size, std::u16string& out) {
+  size = Utf8CandidateLength(bytes, size);
   XMLCh block[kStepSize];
   unsigned char sizes[kStepSize];
   XMLSize_t done = 0;

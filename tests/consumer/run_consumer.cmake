@@ -1,7 +1,8 @@
 # Installs the build tree into a scratch prefix, then builds and runs the consumer
 # against it, once through find_package and once through pkg-config.
-# Variables: BUILD_DIR, SOURCE_DIR, WORK_DIR, CXX_FLAGS (the flags the tree was built
-# with, so that a sanitizer build links a sanitizer consumer).
+# Variables: BUILD_DIR, SOURCE_DIR, WORK_DIR, CXX_FLAGS and CXX_COMPILER (the flags and
+# compiler the tree was built with, so that a sanitizer build links a sanitizer consumer
+# of the same sanitizer runtime).
 file(REMOVE_RECURSE ${WORK_DIR})
 set(prefix ${WORK_DIR}/prefix)
 
@@ -15,7 +16,7 @@ endfunction()
 
 run(${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${prefix})
 run(${CMAKE_COMMAND} -S ${SOURCE_DIR} -B ${WORK_DIR}/build -DCMAKE_PREFIX_PATH=${prefix}
-    "-DCMAKE_CXX_FLAGS=${CXX_FLAGS}")
+    "-DCMAKE_CXX_FLAGS=${CXX_FLAGS}" -DCMAKE_CXX_COMPILER=${CXX_COMPILER})
 run(${CMAKE_COMMAND} --build ${WORK_DIR}/build)
 run(${WORK_DIR}/build/consumer)
 if(NOT last_output MATCHES "consumer ok")
@@ -29,5 +30,5 @@ set(ENV{PKG_CONFIG_PATH} ${pc_dir})
 run(pkg-config --cflags --libs qzscoring)
 string(STRIP "${last_output}" flags)
 separate_arguments(flags UNIX_COMMAND "${CXX_FLAGS} ${flags}")
-run(c++ -std=c++17 ${SOURCE_DIR}/consumer.cpp -o ${WORK_DIR}/consumer_pc ${flags})
+run(${CXX_COMPILER} -std=c++17 ${SOURCE_DIR}/consumer.cpp -o ${WORK_DIR}/consumer_pc ${flags})
 run(${WORK_DIR}/consumer_pc)

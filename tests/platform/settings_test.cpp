@@ -143,7 +143,8 @@ TEST(Settings, DeepCopies) {
   ASSERT_TRUE(settings.GetSettingValByName("a", text));
   EXPECT_EQ("1", text);
 
-  copy = copy;
+  QZSettings& same = copy;
+  copy = same;  // self-assignment
   EXPECT_EQ(2, copy.Size());
   std::unique_ptr<IQZSettingValue> clone(copy.GetSettingAt(1)->GetValue()->Clone());
   copy.RemoveSetting("self");

@@ -97,7 +97,8 @@ TEST(ValueRecordTest, CopiesAreIndependent) {
   EXPECT_EQ(assigned.Names(), copy.Names());
   assigned = original;  // a different layout replaces the names too
   EXPECT_EQ(assigned.Get("w").GetReal(), 4.0);
-  assigned = assigned;  // NOLINT: self-assignment keeps the record
+  ValueRecord& same = assigned;
+  assigned = same;  // self-assignment keeps the record
   EXPECT_EQ(assigned.Size(), 3u);
 
   ValueRecord moved(std::move(assigned));

@@ -165,9 +165,10 @@ TEST(ValueTest, CopyMoveAndAssign) {
   v = size_t{7};
   EXPECT_EQ(v.GetReal(), 7.0);
   v = 4;
-  v = v;  // NOLINT: self-assignment keeps the value
+  Value& same = v;
+  v = same;  // self-assignment keeps the value
   EXPECT_EQ(v.GetReal(), 4.0);
-  v = std::move(v);  // NOLINT
+  v = std::move(same);
   EXPECT_EQ(v.GetReal(), 4.0);
 
   std::unique_ptr<Value> clone(s.Clone());

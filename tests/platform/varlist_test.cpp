@@ -236,7 +236,8 @@ TEST(VarList, CopiesAreDeep) {
   flag->SetFormat(format);
 
   QZVarList copy = list;
-  copy = copy;  // self-assignment keeps the content
+  QZVarList& same = copy;
+  copy = same;  // self-assignment keeps the content
   list.GetEncoderAt(0)->AddCategory("maybe");
   flag->SetFormat(nullptr);
   flag->SetBinaryFlag(false, 1);

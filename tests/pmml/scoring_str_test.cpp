@@ -48,7 +48,8 @@ TEST(ScoringStrTest, CopiesAndAssignmentsAreIndependent) {
   original.append(u"d");
   EXPECT_EQ(Text(copy), u"abc");
 
-  copy = copy;
+  ScoringStr& same = copy;
+  copy = same;  // self-assignment
   EXPECT_EQ(Text(copy), u"abc");
   copy = copy.xc_str();
   EXPECT_EQ(Text(copy), u"abc");

@@ -771,8 +771,8 @@ Outcome HugeArrayCount() {
 class RepeatBuffer : public std::streambuf {
  public:
   RepeatBuffer(std::string prefix, char fill, size_t count, std::string suffix)
-      : prefix_(std::move(prefix)), suffix_(std::move(suffix)), fill_(fill), left_(count) {
-    chunk_.assign(1 << 16, fill);
+      : prefix_(std::move(prefix)), suffix_(std::move(suffix)), chunk_(1 << 16, fill),
+        left_(count) {
     setg(prefix_.data(), prefix_.data(), prefix_.data() + prefix_.size());
   }
 
@@ -794,7 +794,6 @@ class RepeatBuffer : public std::streambuf {
 
  private:
   std::string prefix_, suffix_, chunk_;
-  char fill_;
   size_t left_;
   bool suffixDone_ = false;
 };

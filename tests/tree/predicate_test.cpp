@@ -32,7 +32,6 @@ using P = ScoringPredicate;
 constexpr P::PredicateResult T = P::PREDICATE_TRUE;
 constexpr P::PredicateResult F = P::PREDICATE_FALSE;
 constexpr P::PredicateResult U = P::PREDICATE_UNKNOWN;
-constexpr int kNotRun = -1;
 
 // A child with a fixed result that counts its evaluations.
 class Probe : public ScoringPredicate {
@@ -172,7 +171,8 @@ TEST(CompoundPredicate, OwnershipCopiesAndRemoval) {
   ScoringCompoundPredicate target(P::BOOL_OR);
   target.AddPredicate(new ScoringFalsePredicate());
   target = source;
-  target = target;
+  ScoringCompoundPredicate& same = target;
+  target = same;  // self-assignment
   EXPECT_EQ(3, target.GetCount());
   EXPECT_EQ(P::BOOL_AND, target.GetBoolOperator());
 

@@ -94,7 +94,8 @@ TEST(ScoringRange, CopiesSettersAndDisplay) {
 
   ScoringRange assigned(0.0, 1.0, false, true);
   assigned = range;
-  assigned = assigned;
+  ScoringRange& same = assigned;
+  assigned = same;  // self-assignment
   EXPECT_TRUE(assigned == range);
 
   range.SetMin(nullptr);
