@@ -4,6 +4,10 @@
 #   ./build.sh demo       install what the build needs, build, score a bundled example
 #   ./build.sh test       install what the build needs, build, run the whole test suite
 #   ./build.sh sanitize   the test suite under AddressSanitizer and UndefinedBehaviorSanitizer
+#   ./build.sh fuzz [S]   every libFuzzer harness for S seconds (default 60) on its seeds
+#   ./build.sh tsan       the thread stress test under ThreadSanitizer ("tsan all": the suite)
+#   ./build.sh coverage   line coverage of src/ and platform/ over the whole suite (gcovr)
+#   ./build.sh robustness hostile documents and data; rewrites docs/robustness.md
 #
 # Installing packages needs root; as another user the script names the missing packages
 # and stops.
@@ -55,8 +59,24 @@ case "${1:-}" in
     build build-asan -DCMAKE_BUILD_TYPE=Debug "-DCMAKE_CXX_FLAGS=$flags"
     ASAN_OPTIONS=detect_leaks=1 ctest --test-dir build-asan --output-on-failure -j"$jobs"
     ;;
+  fuzz)
+    setup
+    fuzz/run.sh "${2:-60}"
+    ;;
+  tsan)
+    setup
+    scripts/tsan.sh "${2:-stress}"
+    ;;
+  coverage)
+    setup
+    scripts/coverage.sh "$jobs"
+    ;;
+  robustness)
+    setup
+    scripts/robustness.sh "$jobs"
+    ;;
   *)
-    echo "usage: $0 demo|test|sanitize" >&2
+    echo "usage: $0 demo|test|sanitize|fuzz [seconds]|tsan [all]|coverage|robustness" >&2
     exit 2
     ;;
 esac
