@@ -5,6 +5,7 @@
 
 #include "PluginDom.h"
 #include "QZMV.h"
+#include "ScoringPredicate.h"
 
 namespace QZPlugin_800 {
 
@@ -73,6 +74,35 @@ int CategoryTable::Match(const QZCommon_800::Value& value) const noexcept {
   }
   if (value.IsNumericValue() && !value.IsSystemMissingValue()) return MatchNumber(value.GetReal());
   return -1;
+}
+
+int CategoryCodeMemo::Add(const QZXML_800::IQZVariable* variable) {
+  for (size_t i = 0; i < entries_.size(); ++i) {
+    if (entries_[i].variable == variable) {
+      ++entries_[i].users;
+      return static_cast<int>(i);
+    }
+  }
+  entries_.push_back({variable, std::string(), 0, 1, false});
+  return static_cast<int>(entries_.size() - 1);
+}
+
+int CategoryCodeMemo::Code(int slot, const QZCommon_800::Value& value) noexcept {
+  Entry& entry = entries_[static_cast<size_t>(slot)];
+  if (entry.users < 2 || !value.IsString()) {
+    return QZScoring_800::ScoringPredicate::CategoryCode(entry.variable, value);
+  }
+  const std::string& text = value.GetText();
+  if (entry.known && entry.text == text) return entry.code;
+  entry.known = false;
+  try {
+    entry.text = text;  // reuses the capacity of the text before
+  } catch (...) {
+    return QZScoring_800::ScoringPredicate::CategoryCode(entry.variable, value);
+  }
+  entry.code = QZScoring_800::ScoringPredicate::CategoryCode(entry.variable, value);
+  entry.known = true;
+  return entry.code;
 }
 
 }  // namespace QZPlugin_800

@@ -9,6 +9,10 @@
 
 #include "Value.h"
 
+namespace QZXML_800 {
+class IQZVariable;
+}
+
 namespace QZPlugin_800 {
 
 // The categories of one field, in the order they were interned (a target's dictionary
@@ -46,6 +50,30 @@ class CategoryTable {
   std::vector<QZCommon_800::Value> values_;
   std::vector<double> numbers_;  // the text read as a number; NaN when it is none
   std::unordered_map<std::string, int> index_;
+};
+
+// The CategoryCode (ScoringPredicate::CategoryCode) of the text a categorical field
+// holds, shared by every model of one document: the trees of an ensemble test the same
+// fields of one record, and finding a text among a field's categories costs far more
+// than comparing it with the text found last. Each variable keeps its last text and
+// code; a value that is no text, or a field only one model tests, is not kept. One
+// thread at a time.
+class CategoryCodeMemo {
+ public:
+  // The slot of the variable, added when new (at compile time, once per model that
+  // tests it).
+  int Add(const QZXML_800::IQZVariable* variable);
+  int Code(int slot, const QZCommon_800::Value& value) noexcept;
+
+ private:
+  struct Entry {
+    const QZXML_800::IQZVariable* variable;
+    std::string text;
+    int code;
+    int users;   // the models that test the variable
+    bool known;  // text and code belong together
+  };
+  std::vector<Entry> entries_;
 };
 
 }  // namespace QZPlugin_800

@@ -67,6 +67,8 @@ std::vector<std::string> DocumentContext::DeclaredCategories(
   return categories;
 }
 
+CategoryCodeMemo& DocumentContext::CategoryCodes() { return owner_.codes_; }
+
 bool DocumentContext::DeclaresMissingValues(const std::string& field) const {
   const xercesc::DOMElement* element = DataField(field);
   for (const xercesc::DOMElement* child : ChildElements(element)) {

@@ -115,6 +115,10 @@ class DocumentContext {
   // variable's encoder about each value.
   bool DeclaresMissingValues(const std::string& field) const;
 
+  // The category codes of categorical fields' values, shared by every model of the
+  // document. Owned by the compiled document.
+  CategoryCodeMemo& CategoryCodes();
+
   // The category table of a target field, shared by every model of the document that
   // predicts it, created from its declared categories on first use. Owned by the
   // compiled document.
@@ -283,6 +287,7 @@ class CompiledDocument {
   QZXML_800::QZVarList variables_;
   std::vector<std::unique_ptr<QZXML_800::QZVarList>> scopes_;
   std::map<std::string, std::unique_ptr<CategoryTable>> categories_;
+  CategoryCodeMemo codes_;
   std::unique_ptr<CompiledModel> root_;
 };
 

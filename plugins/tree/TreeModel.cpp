@@ -128,30 +128,47 @@ enum class Test : uint8_t { kAlways, kNever, kNumeric, kCategory, kEvaluate };
 // certain of (probability and confidence 1), or a distribution row.
 enum class Decision : uint8_t { kNothing, kCertain, kDistribution };
 
-// One node as scoring reads it, 48 bytes: how its predicate is tested, where its
-// children are, and (classification) what it predicts. The children of a node are
-// consecutive in the array, so the tests of siblings, made one after the other, lie
-// side by side, and the node that decides is the one just tested.
+// A NumericTest without its encoder (which the tree keeps once per field): the range
+// and the three results packed into one byte beside the inclusion marks.
+struct NumericRange {
+  double low;
+  double high;
+};
+
+// One node as scoring reads it, 32 bytes, so that two siblings usually share a cache
+// line: how its predicate is tested and where its children are. What a node predicts
+// and its id lie in arrays of their own, read only by the node that decides. The
+// children of a node are consecutive in the array, so the tests of siblings, made one
+// after the other, lie side by side, and the node that decides is the one just tested.
 struct Node {
   union {
-    QZScoring_800::ScoringSimplePredicate::NumericTest numeric;
-    ScoringPredicate::CategoryTest category;
+    NumericRange numeric;                    // kNumeric
+    ScoringPredicate::CategoryTest category;  // kCategory
   };
-  Test test : 4;
-  Decision decision : 4;
-  bool hasId = false;       // ids_ holds the node's id
-  uint16_t field = 0;       // kNumeric: the field's slot; kCategory: its categoryFields_ entry
   uint32_t firstChild = 0;  // children: [firstChild, endChild)
   uint32_t endChild = 0;
-  uint32_t outcome = 0;     // kCertain: the category; kDistribution: the row
+  uint16_t field = 0;       // kNumeric: the field's slot; kCategory: its categoryFields_ entry
+  Test test : 4;
+  Decision decision : 4;
+  // kNumeric: bit 0 low end included, bit 1 high end included, then two bits each for
+  // the results of a missing value, a number in the range and any other number.
+  uint8_t form = 0;
 
   Node() : numeric(), test(Test::kEvaluate), decision(Decision::kNothing) {}
 };
+static_assert(sizeof(Node) == 32, "two nodes to a cache line");
+
+uint8_t PackNumericForm(const QZScoring_800::ScoringSimplePredicate::NumericTest& test) {
+  return static_cast<uint8_t>((test.lowIncluded ? 1 : 0) | (test.highIncluded ? 2 : 0) |
+                              (test.missing & 3) << 2 | (test.inRange & 3) << 4 |
+                              (test.outOfRange & 3) << 6);
+}
 
 // A categorical field that category tests read.
 struct CategoryField {
   int slot;
   const QZXML_800::IQZVariable* variable;
+  int memo;  // its slot in the document's CategoryCodeMemo
 };
 
 // One ScoreDistribution as read, before the category count is final.
@@ -189,10 +206,7 @@ class TreeEvaluator : public ModelEvaluator {
       case Test::kNever:
         return ScoringPredicate::PREDICATE_FALSE;
       case Test::kNumeric:
-        if (QZScoring_800::ScoringSimplePredicate::EvaluateNumericTest(
-                node.numeric, fields.Get(node.field), outcome)) {
-          return outcome;
-        }
+        if (EvaluateNumeric(node, fields.Get(node.field), outcome)) return outcome;
         break;
       case Test::kCategory:
         if (ScoringPredicate::EvaluateCategoryTest(node.category, CategoryCode(node.field, fields),
@@ -205,11 +219,30 @@ class TreeEvaluator : public ModelEvaluator {
     }
     return predicates_[index]->Evaluate(fields.Record());
   }
+  // What ScoringSimplePredicate::EvaluateNumericTest answers for the node's test.
+  bool EvaluateNumeric(const Node& node, const Value& value, Outcome& result) const {
+    if (value.IsNumericValue()) {
+      const double x = value.GetReal();
+      unsigned shift = 2;  // the missing result
+      if (!value.IsSystemMissingValue() && !encoders_[node.field]->IsMissingNumber(x)) {
+        const bool above = (node.form & 1) != 0 ? x >= node.numeric.low : x > node.numeric.low;
+        const bool below = (node.form & 2) != 0 ? x <= node.numeric.high : x < node.numeric.high;
+        shift = above && below ? 4 : 6;
+      }
+      result = static_cast<Outcome>((node.form >> shift) & 3);
+      return true;
+    }
+    if (value.IsNull()) {
+      result = static_cast<Outcome>((node.form >> 2) & 3);
+      return true;
+    }
+    return false;
+  }
   // The CategoryCode of a category field's value, worked out once per record.
   int CategoryCode(uint32_t field, const FieldView& fields) {
     if (codeRecord_[field] != record_) {
       const CategoryField& category = categoryFields_[field];
-      codes_[field] = ScoringPredicate::CategoryCode(category.variable, fields.Get(category.slot));
+      codes_[field] = memo_->Code(category.memo, fields.Get(category.slot));
       codeRecord_[field] = record_;
     }
     return codes_[field];
@@ -233,7 +266,13 @@ class TreeEvaluator : public ModelEvaluator {
   std::vector<std::unique_ptr<ScoringPredicate>> predicates_;
   std::vector<uint32_t> defaultChildren_;  // kNoNode when none
   std::vector<Value> ids_;                 // the node ids (null for a node without one)
+  std::vector<uint8_t> hasId_;             // ids_ holds the node's id
+  std::vector<uint32_t> outcomes_;  // kCertain: the category; kDistribution: the row
+  // Per field slot of a numeric test: the encoder that judges its declared missing
+  // numbers (one variable per field name, so one encoder).
+  std::vector<const QZXML_800::IQZEncoder*> encoders_;
   std::vector<CategoryField> categoryFields_;
+  CategoryCodeMemo* memo_;  // the document's, shared with the other trees
   // Per distribution row: `categories_` probabilities, then as many confidences.
   std::vector<double> rows_;
   // Per distribution row, `categories_` record counts (for aggregateNodes).
@@ -252,7 +291,8 @@ class TreeEvaluator : public ModelEvaluator {
   double sumWeight_ = 0.0;
 };
 
-TreeEvaluator::TreeEvaluator(ModelContext& context) {
+TreeEvaluator::TreeEvaluator(ModelContext& context)
+    : memo_(&context.Document().CategoryCodes()) {
   const DomReader& reader = context.Reader();
   const DOMElement* model = context.Element();
   strategy_ = ParseMissingStrategy(reader.Attr(model, u"missingValueStrategy"));
@@ -336,9 +376,11 @@ void TreeEvaluator::CompileNode(ModelContext& context, uint32_t index,
   CompileTest(context, nodes_[index], *predicates_.back());
 
   ids_.emplace_back();
+  hasId_.push_back(0);
+  outcomes_.push_back(0);
   if (DomReader::Has(element, u"id")) {
     ids_.back() = Value(reader.Attr(element, u"id"));
-    nodes_[index].hasId = true;
+    hasId_.back() = 1;
   }
   scores_.push_back(kNaN);
   predicted_.push_back(-1);
@@ -390,12 +432,18 @@ void TreeEvaluator::CompileTest(ModelContext& context, Node& node,
       return;
     case ScoringPredicate::SIMPLE_PREDICATE: {
       const auto& simple = static_cast<const QZScoring_800::ScoringSimplePredicate&>(predicate);
-      if (simple.GetNumericTest(node.numeric)) {
+      QZScoring_800::ScoringSimplePredicate::NumericTest numeric;
+      if (simple.GetNumericTest(numeric)) {
         const int slot = context.AddField(split->GetSplitName());
-        if (slot <= UINT16_MAX) {
-          node.test = Test::kNumeric;
-          node.field = static_cast<uint16_t>(slot);
-        }
+        if (slot < 0 || slot > UINT16_MAX) return;
+        const size_t at = static_cast<size_t>(slot);
+        if (encoders_.size() <= at) encoders_.resize(at + 1, nullptr);
+        if (encoders_[at] == nullptr) encoders_[at] = numeric.encoder;
+        if (encoders_[at] != numeric.encoder) return;  // left to the predicate
+        node.numeric = {numeric.low, numeric.high};
+        node.form = PackNumericForm(numeric);
+        node.test = Test::kNumeric;
+        node.field = static_cast<uint16_t>(slot);
         return;
       }
       if (simple.GetCategoryTest(node.category)) node.test = Test::kCategory;
@@ -417,7 +465,7 @@ void TreeEvaluator::CompileTest(ModelContext& context, Node& node,
   while (field < categoryFields_.size() && categoryFields_[field].slot != slot) ++field;
   if (field == categoryFields_.size()) {
     if (field > UINT16_MAX) return;
-    categoryFields_.push_back({slot, variable});
+    categoryFields_.push_back({slot, variable, memo_->Add(variable)});
   }
   if (categoryFields_[field].variable != variable) return;  // one field, two variables
   node.test = Test::kCategory;
@@ -476,11 +524,11 @@ void TreeEvaluator::CompileDistributions(const std::vector<std::vector<Entry>>& 
     }
     if (certain) {
       node.decision = Decision::kCertain;
-      node.outcome = static_cast<uint32_t>(category);
+      outcomes_[i] = static_cast<uint32_t>(category);
       continue;
     }
     node.decision = Decision::kDistribution;
-    node.outcome = static_cast<uint32_t>(counts_.size() / k);
+    outcomes_[i] = static_cast<uint32_t>(counts_.size() / k);
     rows_.insert(rows_.end(), p.begin(), p.end());
     rows_.insert(rows_.end(), c.begin(), c.end());
     counts_.insert(counts_.end(), n.begin(), n.end());
@@ -492,7 +540,7 @@ void TreeEvaluator::ResolveDefaultChildren(const std::vector<std::string>& defau
     const Node& node = nodes_[i];
     if (defaults[i].empty() || node.firstChild == node.endChild) continue;
     for (uint32_t c = node.firstChild; c < node.endChild; ++c) {
-      if (nodes_[c].hasId && ids_[c].GetText() == defaults[i]) defaultChildren_[i] = c;
+      if (hasId_[c] != 0 && ids_[c].GetText() == defaults[i]) defaultChildren_[i] = c;
     }
     if (defaultChildren_[i] == kNoNode) {
       throw CompileError("Node defaultChild '" + defaults[i] + "' names none of its children");
@@ -572,7 +620,7 @@ void TreeEvaluator::Decide(uint32_t index, int missing, ModelResult& result) con
     for (int i = 0; i < missing; ++i) factor *= penalty_;
     if (node.decision == Decision::kCertain) {
       // Reset left every probability and confidence at zero.
-      const size_t category = node.outcome;
+      const size_t category = outcomes_[index];
       if (category < result.probabilities.size()) {
         result.probabilities[category] = 1.0;
         result.confidences[category] = factor;
@@ -580,7 +628,7 @@ void TreeEvaluator::Decide(uint32_t index, int missing, ModelResult& result) con
       result.category = static_cast<int>(category);
     } else if (node.decision == Decision::kDistribution) {
       const size_t k = std::min(categories_, result.probabilities.size());
-      const double* p = &rows_[2 * node.outcome * categories_];
+      const double* p = &rows_[2 * outcomes_[index] * categories_];
       const double* c = p + categories_;
       for (size_t j = 0; j < k; ++j) {
         result.probabilities[j] = p[j];
@@ -593,7 +641,7 @@ void TreeEvaluator::Decide(uint32_t index, int missing, ModelResult& result) con
     result.hasProbabilities = true;
     result.hasConfidences = true;
   }
-  result.entityId = node.hasId ? &ids_[index] : nullptr;
+  result.entityId = hasId_[index] != 0 ? &ids_[index] : nullptr;
   result.state = ModelResult::kValue;
 }
 
@@ -676,7 +724,7 @@ void TreeEvaluator::FollowBranches(const FieldView& fields, uint32_t entity,
         std::max_element(decisive.begin(), decisive.begin() + static_cast<long>(k)) -
         decisive.begin());
   }
-  result.entityId = nodes_[entity].hasId ? &ids_[entity] : nullptr;
+  result.entityId = hasId_[entity] != 0 ? &ids_[entity] : nullptr;
   result.state = ModelResult::kValue;
 }
 
@@ -695,14 +743,14 @@ void TreeEvaluator::Gather(uint32_t index, double weight) {
   if (node.decision == Decision::kNothing) return;
   if (node.decision == Decision::kCertain) {
     const double w = weighted ? weight : weights_[index];
-    sumProbabilities_[node.outcome] += w;
-    sumConfidences_[node.outcome] += w;
+    sumProbabilities_[outcomes_[index]] += w;
+    sumConfidences_[outcomes_[index]] += w;
     sumWeight_ += w;
     return;
   }
-  const double* p = &rows_[2 * node.outcome * categories_];
+  const double* p = &rows_[2 * outcomes_[index] * categories_];
   const double* c = p + categories_;
-  const double* n = &counts_[node.outcome * categories_];
+  const double* n = &counts_[outcomes_[index] * categories_];
   for (size_t j = 0; j < categories_; ++j) {
     if (weighted) {
       sumProbabilities_[j] += weight * p[j];

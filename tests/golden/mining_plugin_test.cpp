@@ -116,6 +116,41 @@ TEST(MiningPlugin, MissingSegmentPredictions) {
   }
 }
 
+// Trees of one ensemble share the category codes of a record's values; a segment that
+// replaces a missing category sees its own value, and a value changed in place between
+// records is never answered from the record before.
+TEST(MiningPlugin, TreesOnOneCategoricalFieldAgreeRecordByRecord) {
+  const auto tree = [](const std::string& replacement, int p, int q) {
+    return R"(<TreeModel functionName="regression" noTrueChildStrategy="returnLastPrediction">
+      <MiningSchema><MiningField name="c")" + replacement + R"(/></MiningSchema>
+      <Node score="0"><True/>
+        <Node score=")" + std::to_string(p) + R"("><SimplePredicate field="c" operator="equal" value="P"/></Node>
+        <Node score=")" + std::to_string(q) + R"("><SimpleSetPredicate field="c" booleanOperator="isIn">
+          <Array n="1" type="string">Q</Array></SimpleSetPredicate></Node>
+      </Node></TreeModel>)";
+  };
+  auto model = qztest::CreateModel(Document(
+      R"(multipleModelMethod="sum")",
+      Segment("plain", tree("", 1, 2)) +
+          Segment("replacing", tree(R"( missingValueReplacement="Q")", 10, 20)) +
+          Segment("again", tree("", 100, 200))));
+  ASSERT_NE(model, nullptr);
+  ValueRecord input, output;
+  input.Add("x", 0.0);
+  input.Add("z", 0.0);
+  input.Add("c", "P");
+  ASSERT_TRUE(model->Scorable(output).IsOK());
+  const struct {
+    const char* c;  // null: missing
+    double sum;
+  } records[] = {{"P", 111}, {"Q", 222}, {nullptr, 20}, {"Q", 222}, {"P", 111}, {"P", 111}};
+  for (const auto& r : records) {
+    input[2] = r.c != nullptr ? Value(std::string(r.c)) : Value::NULL_VALUE;
+    ASSERT_TRUE(model->Score(input, output).IsOK());
+    EXPECT_DOUBLE_EQ(output.Get("prediction").GetReal(), r.sum) << (r.c ? r.c : "missing");
+  }
+}
+
 // selectAll: the first used segment that predicts decides, and the entityId output is
 // a structured value with every segment's prediction by id (null when the segment was
 // not used or predicted nothing).
