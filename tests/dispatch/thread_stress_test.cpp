@@ -37,6 +37,7 @@
 #include "QZMV.h"
 #include "QZSettings.h"
 #include "QZVarList.h"
+#include "CorpusText.h"
 #include "ReferencePlugins.h"
 #include "ScoringFactory.h"
 #include "ScoringModel.h"
@@ -76,42 +77,6 @@ std::string ReadFile(const std::string& path) {
   std::ostringstream text;
   text << in.rdbuf();
   return text.str();
-}
-
-Names SplitCsv(const std::string& line) {
-  Names cells;
-  std::string cell;
-  bool quoted = false;
-  for (size_t i = 0; i < line.size(); ++i) {
-    const char c = line[i];
-    if (quoted) {
-      if (c == '"' && i + 1 < line.size() && line[i + 1] == '"') {
-        cell += '"';
-        ++i;
-      } else if (c == '"') {
-        quoted = false;
-      } else {
-        cell += c;
-      }
-    } else if (c == '"') {
-      quoted = true;
-    } else if (c == ',') {
-      cells.push_back(cell);
-      cell.clear();
-    } else if (c != '\r') {
-      cell += c;
-    }
-  }
-  cells.push_back(cell);
-  return cells;
-}
-
-bool ParseNumber(const std::string& text, double& out) {
-  if (text.empty()) return false;
-  const double d = Value::TextToReal(text);
-  if (QZCommon_800::QZMV::IsMissing(d)) return false;
-  out = d;
-  return true;
 }
 
 // Every bit of a value: reals in hexadecimal, structured values entry by entry.
@@ -234,7 +199,7 @@ struct Inputs {
       double number = 0.0;
       if (cell.empty()) {
         record[i] = Value();
-      } else if (columns[i].second && ParseNumber(cell, number)) {
+      } else if (columns[i].second && qztest::ParseNumber(cell, number)) {
         record[i] = number;
       } else {
         record[i] = cell;
@@ -269,10 +234,10 @@ bool Agrees(const std::string& expected, const Value& actual) {
   if (expected.empty()) return actual.IsMissing();
   if (actual.IsMissing()) return false;
   double e = 0.0, a = 0.0;
-  if (ParseNumber(expected, e)) {
+  if (qztest::ParseNumber(expected, e)) {
     if (actual.IsNumericValue()) {
       a = actual.GetReal();
-    } else if (!ParseNumber(actual.GetString(), a)) {
+    } else if (!qztest::ParseNumber(actual.GetString(), a)) {
       return false;
     }
     return std::fabs(e - a) <= 1e-6 * std::max({std::fabs(e), std::fabs(a), 1e-300});
@@ -480,9 +445,9 @@ TEST(ThreadStress, FactoriesModelsAndPredicatesInManyThreadsAgreeWithOneThread) 
     ASSERT_TRUE(table.good()) << job.table;
     std::string line;
     std::getline(table, line);
-    job.header = SplitCsv(line);
+    job.header = qztest::SplitCsv(line);
     while (std::getline(table, line)) {
-      if (!line.empty()) job.rows.push_back(SplitCsv(line));
+      if (!line.empty()) job.rows.push_back(qztest::SplitCsv(line));
     }
     ASSERT_FALSE(job.rows.empty()) << job.table;
     job.repeat = (kRecordsPerDocument + job.rows.size() - 1) / job.rows.size();

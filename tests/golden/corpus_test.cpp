@@ -30,6 +30,7 @@
 #include "ScoringModel.h"
 #include "Value.h"
 #include "ValueRecord.h"
+#include "CorpusText.h"
 #include "ReferencePlugins.h"
 
 using QZCommon_800::Value;
@@ -68,42 +69,6 @@ std::string TestsDir() {
 // The corpus folder: the build's QZSCORING_CORPUS_DIR.
 std::string CorpusDir() { return QZ_CORPUS_DIR; }
 
-std::vector<std::string> SplitCsv(const std::string& line) {
-  std::vector<std::string> cells;
-  std::string cell;
-  bool quoted = false;
-  for (size_t i = 0; i < line.size(); ++i) {
-    const char c = line[i];
-    if (quoted) {
-      if (c == '"' && i + 1 < line.size() && line[i + 1] == '"') {
-        cell += '"';
-        ++i;
-      } else if (c == '"') {
-        quoted = false;
-      } else {
-        cell += c;
-      }
-    } else if (c == '"') {
-      quoted = true;
-    } else if (c == ',') {
-      cells.push_back(cell);
-      cell.clear();
-    } else if (c != '\r') {
-      cell += c;
-    }
-  }
-  cells.push_back(cell);
-  return cells;
-}
-
-bool ParseNumber(const std::string& text, double& out) {
-  if (text.empty()) return false;
-  const double d = Value::TextToReal(text);
-  if (QZCommon_800::QZMV::IsMissing(d)) return false;
-  out = d;
-  return true;
-}
-
 // Numbers agree to 1e-6 relative; magnitudes below the normal double range (where
 // relative precision is lost) agree when both are that small.
 bool NumbersAgree(double expected, double actual) {
@@ -117,9 +82,9 @@ bool Agrees(const std::string& expected, const Value& actual) {
   if (expected.empty()) return actual.IsMissing();
   if (actual.IsMissing()) return false;
   double e = 0.0, a = 0.0;
-  if (ParseNumber(expected, e)) {
+  if (qztest::ParseNumber(expected, e)) {
     if (actual.IsNumericValue()) return NumbersAgree(e, actual.GetReal());
-    if (ParseNumber(actual.GetString(), a)) return NumbersAgree(e, a);
+    if (qztest::ParseNumber(actual.GetString(), a)) return NumbersAgree(e, a);
   }
   return actual.GetString() == expected;
 }
@@ -157,7 +122,7 @@ Outcome RunDataset(const std::string& model, const std::string& pmml, const std:
 
   std::string line;
   std::getline(data, line);
-  const std::vector<std::string> header = SplitCsv(line);
+  const std::vector<std::string> header = qztest::SplitCsv(line);
   // Inputs: the columns named like a field of the model (the first of repeated names),
   // each read as its field's storage asks: numbers for numeric storage, text otherwise.
   ValueRecord input;
@@ -191,14 +156,14 @@ Outcome RunDataset(const std::string& model, const std::string& pmml, const std:
 
   while (std::getline(data, line)) {
     if (line.empty()) continue;
-    const std::vector<std::string> cells = SplitCsv(line);
+    const std::vector<std::string> cells = qztest::SplitCsv(line);
     for (size_t i = 0; i < inputs.size(); ++i) {
       const size_t c = inputs[i].first;
       const std::string cell = c < cells.size() ? cells[c] : std::string();
       double number = 0.0;
       if (cell.empty()) {
         input[i] = Value();
-      } else if (inputs[i].second && ParseNumber(cell, number)) {
+      } else if (inputs[i].second && qztest::ParseNumber(cell, number)) {
         input[i] = number;
       } else {
         input[i] = cell;
