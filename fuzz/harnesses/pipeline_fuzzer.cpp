@@ -15,6 +15,7 @@
 #include "FuzzSupport.h"
 #include "QZSettings.h"
 #include "QZVarList.h"
+#include "ReferenceRegistry.h"
 #include "ScoringFactory.h"
 #include "ScoringModel.h"
 #include "ValueRecord.h"
@@ -27,20 +28,6 @@ using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 
 namespace {
-
-QZXML_800::QZSettings ReferenceRegistry() {
-  QZXML_800::QZSettings scoring, models, settings;
-  scoring.AddSetting("TreeModel", "QZTree", false);
-  scoring.AddSetting("RegressionModel", "QZRegression", false);
-  scoring.AddSetting("MiningModel", "QZMining", false);
-  scoring.AddSetting("Veritor", "QZMining", false);
-  models.AddSetting("MiningModel", "", false);
-  models.AddSetting("TreeModel", "", false);
-  models.AddSetting("RegressionModel", "", false);
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  return settings;
-}
 
 // A value for the variable in record r: its categories in turn, numbers, or missing.
 Value ValueFor(const QZXML_800::IQZVariable* variable, size_t r, size_t salt) {
@@ -85,7 +72,7 @@ extern "C" int LLVMFuzzerInitialize(int*, char***) {
 }
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-  QZXML_800::QZSettings settings = ReferenceRegistry();
+  QZXML_800::QZSettings settings = qztest::ReferenceRegistry();
   QZScoring_800::ScoringFactory factory;
   std::istringstream pmml(std::string(reinterpret_cast<const char*>(data), size));
   std::unique_ptr<QZScoring_800::ScoringModel> model(factory.CreateScoringModel(settings, pmml));

@@ -11,6 +11,7 @@
 #include <xercesc/sax2/Attributes.hpp>
 #include <xercesc/util/PlatformUtils.hpp>
 
+#include "XercesTestEnvironment.h"
 #include "QZSafeParser.h"
 #include "ScoringSAX2Handler.h"
 #include "ScoringTranscoder.h"
@@ -18,14 +19,6 @@
 using QZScoring_800::ScoringSAX2Handler;
 
 namespace {
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 // Echoes every element and its text, and notes the "name" attribute of each element.
 class Echo : public ScoringSAX2Handler {

@@ -1,5 +1,6 @@
 // Transformation documents with malformed content: each is refused at load with a
 // status and a message naming what is wrong, never half-loaded.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <sstream>
@@ -7,7 +8,6 @@
 #include <utility>
 
 #include <gtest/gtest.h>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "ValueRecord.h"
 
@@ -15,14 +15,6 @@ namespace {
 
 using QZCommon_800::QZStatus;
 using QZTransformNS_8_0_0::QZTransformation;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 const char kDataField[] = "<DataField name=\"x\" optype=\"continuous\" dataType=\"double\"/>";
 

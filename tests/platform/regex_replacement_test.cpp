@@ -1,12 +1,12 @@
 // The replacement text of the replace function: the references to the text around the
 // match ($` and $'), one- and two-digit group numbers, and a '$' that is no reference.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <sstream>
 #include <string>
 
 #include <gtest/gtest.h>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "Value.h"
 #include "ValueRecord.h"
@@ -17,14 +17,6 @@ using QZCommon_800::QZStatus;
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 // replace(text, pattern, replacement), all three constants.
 Value Replace(const std::string& text, const std::string& pattern,

@@ -1,5 +1,6 @@
 // Transform on a record layout it has bound allocates nothing for numeric fields: this
 // program counts every allocation made through operator new.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <atomic>
@@ -9,7 +10,6 @@
 #include <string>
 
 #include <gtest/gtest.h>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "Value.h"
 #include "ValueRecord.h"
@@ -31,14 +31,6 @@ namespace {
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 const char* const kDocument = R"(<PMML version="4.4"><TransformationDictionary>
  <DefineFunction name="scaled" optype="continuous" dataType="double">

@@ -1,6 +1,7 @@
 // The transformation engine's expression elements (NormContinuous, NormDiscrete,
 // Discretize, MapValues), the options of Apply, user-defined functions, isValid against
 // the data dictionary, refusals at load, nesting limits and the DOM entry point.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <initializer_list>
@@ -27,14 +28,6 @@ using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
 using Inputs = std::initializer_list<std::pair<const char*, Value>>;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 const Value kSysMissing(QZMV::Missing());
 

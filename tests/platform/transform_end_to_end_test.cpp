@@ -2,6 +2,7 @@
 // dictionary holds a user-defined function and eighteen derived fields of every kind,
 // some used before their definition, computed over several records into one record
 // object, every value checked.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <sstream>
@@ -9,7 +10,6 @@
 #include <vector>
 
 #include <gtest/gtest.h>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "QZMV.h"
 #include "Value.h"
@@ -21,14 +21,6 @@ using QZCommon_800::QZMV;
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 const char* const kDocument = R"(<?xml version="1.0" encoding="UTF-8"?>
 <PMML version="4.4" xmlns="http://www.dmg.org/PMML-4_4">

@@ -1,6 +1,7 @@
 // The built-in functions of the transformation engine, family by family: hand-computed
 // results, missing arguments, invalid results, and the refusal of malformed or hostile
 // constant patterns at load.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <cmath>
@@ -10,7 +11,6 @@
 #include <utility>
 
 #include <gtest/gtest.h>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "QZMV.h"
 #include "Value.h"
@@ -23,14 +23,6 @@ using QZCommon_800::QZStatus;
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 std::string C(const std::string& text) { return "<Constant>" + text + "</Constant>"; }
 std::string F(const std::string& field) { return "<FieldRef field=\"" + field + "\"/>"; }

@@ -1,6 +1,7 @@
 // The transformation engine's frame: loading documents and dictionaries, computing
 // derived fields (here of FieldRef and Constant) in dependency order, typing, missing
 // values, refusals at load, and the binding of record layouts.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <sstream>
@@ -22,14 +23,6 @@ using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
 using Names = std::vector<std::string>;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 // A PMML document with data fields x and s and the given derived fields.
 std::string Pmml(const std::string& derivedFields) {

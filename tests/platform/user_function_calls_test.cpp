@@ -1,5 +1,6 @@
 // Calls of user-defined functions (DefineFunction): many arguments, and what the call's
 // Apply options make of an invalid or missing argument.
+#include "XercesTestEnvironment.h"
 #include "QZTransformation.h"
 
 #include <initializer_list>
@@ -8,7 +9,6 @@
 #include <utility>
 
 #include <gtest/gtest.h>
-#include <xercesc/util/PlatformUtils.hpp>
 
 #include "QZMV.h"
 #include "Value.h"
@@ -21,14 +21,6 @@ using QZCommon_800::QZStatus;
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
-
-class XercesEnvironment : public ::testing::Environment {
- public:
-  void SetUp() override { xercesc::XMLPlatformUtils::Initialize(); }
-  void TearDown() override { xercesc::XMLPlatformUtils::Terminate(); }
-};
-::testing::Environment* const kXerces =
-    ::testing::AddGlobalTestEnvironment(new XercesEnvironment);
 
 const Value kSysMissing(QZMV::Missing());
 

@@ -43,6 +43,7 @@
 #include "Csv.h"
 #include "QZDisplay.h"
 #include "Records.h"
+#include "ReferenceRegistry.h"
 #include "QZMV.h"
 #include "QZSettings.h"
 #include "QZTransformation.h"
@@ -188,20 +189,6 @@ std::string TransformDocument(const std::string& functions, const std::string& e
 // ---------------------------------------------------------------------------------------
 // Entry points.
 
-QZSettings ReferenceRegistry() {
-  QZSettings scoring, models, settings;
-  scoring.AddSetting("TreeModel", "QZTree", false);
-  scoring.AddSetting("RegressionModel", "QZRegression", false);
-  scoring.AddSetting("MiningModel", "QZMining", false);
-  scoring.AddSetting("Veritor", "QZMining", false);
-  models.AddSetting("MiningModel", "", false);
-  models.AddSetting("TreeModel", "", false);
-  models.AddSetting("RegressionModel", "", false);
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  return settings;
-}
-
 // Diagnostics the library writes while a call runs.
 class CaptureDisplay {
  public:
@@ -226,7 +213,7 @@ struct Created {
 Created Create(const std::string& document) {
   Created created;
   CaptureDisplay display;
-  QZSettings settings = ReferenceRegistry();
+  QZSettings settings = qztest::ReferenceRegistry();
   ScoringFactory factory;
   std::istringstream in(document);
   created.model.reset(factory.CreateScoringModel(settings, in));

@@ -1,5 +1,5 @@
-// The registry that sends every model element to the reference plug-ins (as qzscore's
-// built-in one does), and a model created from document text through the factory.
+// A model created from document text through the factory with the registry of the
+// reference plug-ins, and the check that such a document is refused.
 #ifndef QZ_TESTS_REFERENCE_PLUGINS_H_
 #define QZ_TESTS_REFERENCE_PLUGINS_H_
 
@@ -11,25 +11,12 @@
 #include <gtest/gtest.h>
 
 #include "QZDisplay.h"
+#include "ReferenceRegistry.h"
 #include "QZSettings.h"
 #include "ScoringFactory.h"
 #include "ScoringModel.h"
 
 namespace qztest {
-
-inline QZXML_800::QZSettings ReferenceRegistry() {
-  QZXML_800::QZSettings scoring, models, settings;
-  scoring.AddSetting("TreeModel", "QZTree", false);
-  scoring.AddSetting("RegressionModel", "QZRegression", false);
-  scoring.AddSetting("MiningModel", "QZMining", false);
-  scoring.AddSetting("Veritor", "QZMining", false);
-  models.AddSetting("MiningModel", "", false);
-  models.AddSetting("TreeModel", "", false);
-  models.AddSetting("RegressionModel", "", false);
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  return settings;
-}
 
 // Null (with the factory's status in *status) when the model cannot be created.
 inline std::unique_ptr<QZScoring_800::ScoringModel> CreateModel(const std::string& pmml,
