@@ -11,6 +11,10 @@ using QZCommon_800::ValueRecord;
 
 ModelEvaluator::~ModelEvaluator() = default;
 
+bool ModelEvaluator::Rebase(const std::vector<int>&, const std::vector<int>&) { return false; }
+
+void ModelEvaluator::EvaluateRow(FieldRow&, const ValueRecord&, ModelResult&) {}
+
 void KindRegistry::Add(const std::string& element, EvaluatorCompiler compiler) {
   for (auto& kind : kinds_) {
     if (kind.first == element) {
@@ -241,6 +245,30 @@ void CompiledModel::PrepareWorking(const ValueRecord& input) {
   }
   for (size_t i = 0; i < input.Size(); ++i) working_[i] = input[i];
   for (size_t i = input.Size(); i < working_.Size(); ++i) working_[i] = Value();
+}
+
+bool CompiledModel::JoinRow(FieldRow& shared, ModelContext& parent) {
+  FieldRow* own = evaluator_->Row();
+  if (own == nullptr || copy_ || engine_ || schema_.HasChecks()) return false;
+  std::vector<int> numbers, categories;
+  for (int i = 0; i < own->Numbers(); ++i) {
+    const int slot = parent.AddField(fields_.Name(own->NumberSlot(i)));
+    numbers.push_back(shared.AddNumber(slot, own->NumberEncoder(i)));
+    if (numbers.back() < 0) return false;
+  }
+  for (int i = 0; i < own->Categories(); ++i) {
+    const int slot = parent.AddField(fields_.Name(own->CategorySlot(i)));
+    categories.push_back(shared.AddCategory(slot, own->CategoryVariable(i)));
+    if (categories.back() < 0) return false;
+  }
+  return evaluator_->Rebase(numbers, categories);
+}
+
+const ModelResult& CompiledModel::ScoreRow(FieldRow& row, const ValueRecord& input) {
+  result_.Reset(categories_ != nullptr ? categories_->Size() : 0);
+  evaluator_->EvaluateRow(row, input, result_);
+  targets_.Finish(result_);
+  return result_;
 }
 
 const ModelResult& CompiledModel::Score(const ValueRecord& input) {

@@ -29,6 +29,7 @@
 
 #include "Categories.h"
 #include "FieldBinder.h"
+#include "FieldRow.h"
 #include "MiningSchema.h"
 #include "ModelResult.h"
 #include "OutputFields.h"
@@ -59,6 +60,19 @@ class ModelEvaluator {
  public:
   virtual ~ModelEvaluator();
   virtual void Evaluate(const FieldView& fields, ModelResult& result) = 0;
+
+  // Evaluators that read their fields through a FieldRow (keyed by the model's slots)
+  // give it here, so that an ensemble can decode one row for all of its models; null
+  // for evaluators that read the record only through FieldView.
+  virtual FieldRow* Row() { return nullptr; }
+  // Moves the evaluator onto an ensemble's row: number i of Row() is number
+  // `numbers[i]` there, category i is category `categories[i]`. Afterwards the
+  // evaluator is called only through EvaluateRow. False (nothing changed) when it
+  // cannot address those places.
+  virtual bool Rebase(const std::vector<int>& numbers, const std::vector<int>& categories);
+  // Evaluate, over the ensemble's row decoded from `record`.
+  virtual void EvaluateRow(FieldRow& row, const QZCommon_800::ValueRecord& record,
+                           ModelResult& result);
 };
 
 // Compiles one model element into its evaluator; throws CompileError when it refuses
@@ -233,6 +247,16 @@ class CompiledModel {
   const QZCommon_800::ValueRecord& Prepared(const QZCommon_800::ValueRecord& input) const {
     return copy_ ? working_ : input;
   }
+  // Lets a parent decode this model's fields into `shared` (its own row, keyed by the
+  // parent's slots of `parent`) when Score would do nothing with the record but hand
+  // it to the evaluator: no working copy, field checks or transformations of its own,
+  // and an evaluator that reads a FieldRow. Returns false, changing nothing, when the
+  // model cannot join (or a field is read with another encoder or variable there).
+  // After joining the parent scores the model only through ScoreRow.
+  bool JoinRow(FieldRow& shared, ModelContext& parent);
+  // Score for a model that joined a row, decoded from `input`.
+  const ModelResult& ScoreRow(FieldRow& row, const QZCommon_800::ValueRecord& input);
+
   // The model's OutputFields.
   OutputStage& Output() { return output_; }
   const MiningSchema& Schema() const { return schema_; }

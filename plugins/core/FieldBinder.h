@@ -66,6 +66,7 @@ class FieldView {
   double Number(int slot) const;
   // The whole record, for services that look fields up themselves (tree predicates).
   const QZCommon_800::ValueRecord& Record() const { return *record_; }
+  const FieldBinder& Binder() const { return *binder_; }
 
  private:
   const QZCommon_800::ValueRecord* record_;

@@ -65,6 +65,7 @@ struct Segment {
   double weight = 1.0;
   std::string id;           // the Segment's id, else its 1-based position
   bool compatible = false;  // predicts the mining model's target in its terms
+  bool joined = false;      // reads the mining model's row (CompiledModel::JoinRow)
   std::unique_ptr<CompiledModel> model;
 
   bool Selected(const ValueRecord& record) const {
@@ -137,6 +138,9 @@ class MiningEvaluator : public ModelEvaluator {
   void SelectAll(const ValueRecord& record, ModelResult& result);
   void Chain(const ValueRecord& record, ModelResult& result);
   const ValueRecord& PrepareChain(const ValueRecord& record);
+  const ModelResult& ScoreSegment(const Segment& segment, const ValueRecord& record) {
+    return segment.joined ? segment.model->ScoreRow(row_, record) : segment.model->Score(record);
+  }
 
   Method method_ = Method::kAverage;
   bool weighted_ = false;
@@ -149,6 +153,9 @@ class MiningEvaluator : public ModelEvaluator {
   // point into it, so that it outlives them.
   std::unique_ptr<QZXML_800::QZVarList> chainScope_;
   std::vector<Segment> segments_;
+  // The fields of the segments that joined it, decoded once per record for all of them.
+  FieldRow row_;
+  bool joined_ = false;
 
   // Per-record scratch; capacities are reserved at compile time or on the first record.
   std::vector<double> values_;   // regression: one prediction per contributing segment
@@ -164,7 +171,8 @@ class MiningEvaluator : public ModelEvaluator {
   std::vector<Value*> entries_;  // selectAll: each segment's entry in summary_
 };
 
-MiningEvaluator::MiningEvaluator(ModelContext& context) {
+MiningEvaluator::MiningEvaluator(ModelContext& context)
+    : row_(context.Document().CategoryCodes()) {
   const DomReader& reader = context.Reader();
   classification_ = context.IsClassification();
   categories_ = context.TargetCategories();
@@ -236,6 +244,14 @@ MiningEvaluator::MiningEvaluator(ModelContext& context) {
         }
       }
       entries_.push_back(&summary_[segments_[i].id]);
+    }
+  }
+  // Segments that read the record as it is (not a chain's, which grows from segment to
+  // segment) decode their fields from one row.
+  if (method_ != Method::kModelChain) {
+    for (Segment& segment : segments_) {
+      segment.joined = segment.model->JoinRow(row_, context);
+      joined_ = joined_ || segment.joined;
     }
   }
   values_.reserve(segments_.size());
@@ -354,6 +370,7 @@ void MiningEvaluator::AddChainedFields(const DomReader& reader, const xercesc::D
 
 void MiningEvaluator::Evaluate(const FieldView& fields, ModelResult& result) {
   const ValueRecord& record = fields.Record();
+  if (joined_) row_.Decode(fields);
   switch (method_) {
     case Method::kSelectFirst:
       SelectFirst(record, result);
@@ -380,7 +397,7 @@ void MiningEvaluator::Combine(const ValueRecord& record, ModelResult& result) {
   double used = 0.0, missing = 0.0;
   for (const Segment& segment : segments_) {
     if (!segment.Selected(record)) continue;
-    const ModelResult& r = segment.model->Score(record);
+    const ModelResult& r = ScoreSegment(segment, record);
     if (r.state == ModelResult::kInvalid) {
       result.state = ModelResult::kInvalid;
       result.error = r.error;
@@ -533,7 +550,7 @@ void MiningEvaluator::FinishClassification(double missingVotes, ModelResult& res
 void MiningEvaluator::SelectFirst(const ValueRecord& record, ModelResult& result) {
   for (const Segment& segment : segments_) {
     if (!segment.Selected(record)) continue;
-    const ModelResult& r = segment.model->Score(record);
+    const ModelResult& r = ScoreSegment(segment, record);
     if (r.state == ModelResult::kMissing && missing_ == MissingPrediction::kSkipSegment) continue;
     Adopt(r, result);
     return;
@@ -547,7 +564,7 @@ void MiningEvaluator::SelectAll(const ValueRecord& record, ModelResult& result) 
     Value& entry = *entries_[i];
     entry = Value();
     if (!segment.Selected(record)) continue;
-    const ModelResult& r = segment.model->Score(record);
+    const ModelResult& r = ScoreSegment(segment, record);
     if (r.state == ModelResult::kInvalid || (r.state == ModelResult::kMissing &&
                                              missing_ == MissingPrediction::kReturnMissing)) {
       Adopt(r, result);

@@ -147,7 +147,7 @@ struct Node {
   };
   uint32_t firstChild = 0;  // children: [firstChild, endChild)
   uint32_t endChild = 0;
-  uint16_t field = 0;       // kNumeric: the field's slot; kCategory: its categoryFields_ entry
+  uint16_t field = 0;       // kNumeric, kCategory: the field's index in the FieldRow
   Test test : 4;
   Decision decision : 4;
   // kNumeric: bit 0 low end included, bit 1 high end included, then two bits each for
@@ -163,13 +163,6 @@ uint8_t PackNumericForm(const QZScoring_800::ScoringSimplePredicate::NumericTest
                               (test.missing & 3) << 2 | (test.inRange & 3) << 4 |
                               (test.outOfRange & 3) << 6);
 }
-
-// A categorical field that category tests read.
-struct CategoryField {
-  int slot;
-  const QZXML_800::IQZVariable* variable;
-  int memo;  // its slot in the document's CategoryCodeMemo
-};
 
 // One ScoreDistribution as read, before the category count is final.
 struct Entry {
@@ -187,6 +180,12 @@ class TreeEvaluator : public ModelEvaluator {
  public:
   explicit TreeEvaluator(ModelContext& context);
   void Evaluate(const FieldView& fields, ModelResult& result) override;
+  FieldRow* Row() override { return &row_; }
+  bool Rebase(const std::vector<int>& numbers, const std::vector<int>& categories) override;
+  void EvaluateRow(FieldRow& row, const QZCommon_800::ValueRecord& record,
+                   ModelResult& result) override {
+    Walk(Input{row, record}, result);
+  }
 
  private:
   void CompileNode(ModelContext& context, uint32_t index,
@@ -197,7 +196,14 @@ class TreeEvaluator : public ModelEvaluator {
   void CompileDistributions(const std::vector<std::vector<Entry>>& entries);
   void ResolveDefaultChildren(const std::vector<std::string>& defaults);
 
-  Outcome Check(uint32_t index, const FieldView& fields) {
+  // One record as the walk reads it: the decoded row, and the record itself for the
+  // predicates the row does not answer.
+  struct Input {
+    FieldRow& row;
+    const QZCommon_800::ValueRecord& record;
+  };
+
+  Outcome Check(uint32_t index, const Input& in) const {
     const Node& node = nodes_[index];
     Outcome outcome = ScoringPredicate::PREDICATE_UNKNOWN;
     switch (node.test) {
@@ -206,10 +212,10 @@ class TreeEvaluator : public ModelEvaluator {
       case Test::kNever:
         return ScoringPredicate::PREDICATE_FALSE;
       case Test::kNumeric:
-        if (EvaluateNumeric(node, fields.Get(node.field), outcome)) return outcome;
+        if (EvaluateNumeric(node, in.row, outcome)) return outcome;
         break;
       case Test::kCategory:
-        if (ScoringPredicate::EvaluateCategoryTest(node.category, CategoryCode(node.field, fields),
+        if (ScoringPredicate::EvaluateCategoryTest(node.category, in.row.Code(node.field),
                                                    outcome)) {
           return outcome;
         }
@@ -217,39 +223,36 @@ class TreeEvaluator : public ModelEvaluator {
       case Test::kEvaluate:
         break;
     }
-    return predicates_[index]->Evaluate(fields.Record());
+    return predicates_[index]->Evaluate(in.record);
   }
-  // What ScoringSimplePredicate::EvaluateNumericTest answers for the node's test.
-  bool EvaluateNumeric(const Node& node, const Value& value, Outcome& result) const {
-    if (value.IsNumericValue()) {
-      const double x = value.GetReal();
-      unsigned shift = 2;  // the missing result
-      if (!value.IsSystemMissingValue() && !encoders_[node.field]->IsMissingNumber(x)) {
-        const bool above = (node.form & 1) != 0 ? x >= node.numeric.low : x > node.numeric.low;
-        const bool below = (node.form & 2) != 0 ? x <= node.numeric.high : x < node.numeric.high;
-        shift = above && below ? 4 : 6;
+  // What ScoringSimplePredicate::EvaluateNumericTest answers for the node's test, from
+  // the decoded number; false for a value only the predicate can judge.
+  static bool EvaluateNumeric(const Node& node, const FieldRow& row, Outcome& result) {
+    const double x = row.Number(node.field);
+    unsigned shift;
+    if (!std::isnan(x)) {
+      const bool above = (node.form & 1) != 0 ? x >= node.numeric.low : x > node.numeric.low;
+      const bool below = (node.form & 2) != 0 ? x <= node.numeric.high : x < node.numeric.high;
+      shift = above && below ? 4 : 6;
+    } else {
+      switch (row.State(node.field)) {
+        case FieldRow::kMissing:
+          shift = 2;
+          break;
+        case FieldRow::kNotANumber:
+          shift = 6;
+          break;
+        default:
+          return false;
       }
-      result = static_cast<Outcome>((node.form >> shift) & 3);
-      return true;
     }
-    if (value.IsNull()) {
-      result = static_cast<Outcome>((node.form >> 2) & 3);
-      return true;
-    }
-    return false;
+    result = static_cast<Outcome>((node.form >> shift) & 3);
+    return true;
   }
-  // The CategoryCode of a category field's value, worked out once per record.
-  int CategoryCode(uint32_t field, const FieldView& fields) {
-    if (codeRecord_[field] != record_) {
-      const CategoryField& category = categoryFields_[field];
-      codes_[field] = memo_->Code(category.memo, fields.Get(category.slot));
-      codeRecord_[field] = record_;
-    }
-    return codes_[field];
-  }
+  void Walk(const Input& in, ModelResult& result);
   void Decide(uint32_t index, int missing, ModelResult& result) const;
-  void PushBranches(const FieldView& fields, uint32_t parent, uint32_t first, double weight);
-  void FollowBranches(const FieldView& fields, uint32_t entity, ModelResult& result);
+  void PushBranches(const Input& in, uint32_t parent, uint32_t first, double weight);
+  void FollowBranches(const Input& in, uint32_t entity, ModelResult& result);
   void Gather(uint32_t index, double weight);
 
   MissingStrategy strategy_ = MissingStrategy::kNone;
@@ -268,22 +271,15 @@ class TreeEvaluator : public ModelEvaluator {
   std::vector<Value> ids_;                 // the node ids (null for a node without one)
   std::vector<uint8_t> hasId_;             // ids_ holds the node's id
   std::vector<uint32_t> outcomes_;  // kCertain: the category; kDistribution: the row
-  // Per field slot of a numeric test: the encoder that judges its declared missing
-  // numbers (one variable per field name, so one encoder).
-  std::vector<const QZXML_800::IQZEncoder*> encoders_;
-  std::vector<CategoryField> categoryFields_;
-  CategoryCodeMemo* memo_;  // the document's, shared with the other trees
+  // The fields the numeric and category tests read, decoded per record (unless the
+  // tree joined its ensemble's row).
+  FieldRow row_;
   // Per distribution row: `categories_` probabilities, then as many confidences.
   std::vector<double> rows_;
   // Per distribution row, `categories_` record counts (for aggregateNodes).
   std::vector<double> counts_;
 
-  // Per-record state: the category codes of the record numbered record_ (codeRecord_
-  // says which record each code belongs to), and the scratch of weightedConfidence and
-  // aggregateNodes, all sized at compile time.
-  uint32_t record_ = 0;
-  std::vector<uint32_t> codeRecord_;
-  std::vector<int> codes_;
+  // The scratch of weightedConfidence and aggregateNodes, sized at compile time.
   std::vector<Branch> branches_;
   std::vector<double> sumProbabilities_;
   std::vector<double> sumConfidences_;
@@ -292,7 +288,7 @@ class TreeEvaluator : public ModelEvaluator {
 };
 
 TreeEvaluator::TreeEvaluator(ModelContext& context)
-    : memo_(&context.Document().CategoryCodes()) {
+    : row_(context.Document().CategoryCodes()) {
   const DomReader& reader = context.Reader();
   const DOMElement* model = context.Element();
   strategy_ = ParseMissingStrategy(reader.Attr(model, u"missingValueStrategy"));
@@ -326,8 +322,6 @@ TreeEvaluator::TreeEvaluator(ModelContext& context)
   for (uint32_t i = 0; i < elements.size(); ++i) {
     CompileNode(context, i, elements, entries, defaults);
   }
-  codeRecord_.assign(categoryFields_.size(), UINT32_MAX);
-  codes_.assign(categoryFields_.size(), ScoringPredicate::CATEGORY_UNDECIDED);
   if (classification_) {
     categories_ = static_cast<size_t>(context.TargetCategories()->Size());
     CompileDistributions(entries);
@@ -434,16 +428,14 @@ void TreeEvaluator::CompileTest(ModelContext& context, Node& node,
       const auto& simple = static_cast<const QZScoring_800::ScoringSimplePredicate&>(predicate);
       QZScoring_800::ScoringSimplePredicate::NumericTest numeric;
       if (simple.GetNumericTest(numeric)) {
-        const int slot = context.AddField(split->GetSplitName());
-        if (slot < 0 || slot > UINT16_MAX) return;
-        const size_t at = static_cast<size_t>(slot);
-        if (encoders_.size() <= at) encoders_.resize(at + 1, nullptr);
-        if (encoders_[at] == nullptr) encoders_[at] = numeric.encoder;
-        if (encoders_[at] != numeric.encoder) return;  // left to the predicate
+        // A field read with two encoders is left to the predicates.
+        const int field = row_.AddNumber(context.AddField(split->GetSplitName()),
+                                         numeric.encoder);
+        if (field < 0 || field > UINT16_MAX) return;
         node.numeric = {numeric.low, numeric.high};
         node.form = PackNumericForm(numeric);
         node.test = Test::kNumeric;
-        node.field = static_cast<uint16_t>(slot);
+        node.field = static_cast<uint16_t>(field);
         return;
       }
       if (simple.GetCategoryTest(node.category)) node.test = Test::kCategory;
@@ -458,18 +450,30 @@ void TreeEvaluator::CompileTest(ModelContext& context, Node& node,
       return;
   }
   if (node.test != Test::kCategory) return;
-  node.test = Test::kEvaluate;  // unless the field has a code of its own below
-  const int slot = context.AddField(split->GetSplitName());
-  const QZXML_800::IQZVariable* variable = split->GetSplitVar();
-  size_t field = 0;
-  while (field < categoryFields_.size() && categoryFields_[field].slot != slot) ++field;
-  if (field == categoryFields_.size()) {
-    if (field > UINT16_MAX) return;
-    categoryFields_.push_back({slot, variable, memo_->Add(variable)});
-  }
-  if (categoryFields_[field].variable != variable) return;  // one field, two variables
+  // A field read through two variables is left to the predicates.
+  node.test = Test::kEvaluate;
+  const int field = row_.AddCategory(context.AddField(split->GetSplitName()),
+                                     split->GetSplitVar());
+  if (field < 0 || field > UINT16_MAX) return;
   node.test = Test::kCategory;
   node.field = static_cast<uint16_t>(field);
+}
+
+// Points the numeric and category tests at the fields' places in the ensemble's row.
+bool TreeEvaluator::Rebase(const std::vector<int>& numbers, const std::vector<int>& categories) {
+  for (const std::vector<int>* places : {&numbers, &categories}) {
+    for (int place : *places) {
+      if (place < 0 || place > UINT16_MAX) return false;
+    }
+  }
+  for (Node& node : nodes_) {
+    if (node.test == Test::kNumeric) {
+      node.field = static_cast<uint16_t>(numbers[node.field]);
+    } else if (node.test == Test::kCategory) {
+      node.field = static_cast<uint16_t>(categories[node.field]);
+    }
+  }
+  return true;
 }
 
 // Makes every node's distribution a probability vector over the target's categories:
@@ -549,11 +553,12 @@ void TreeEvaluator::ResolveDefaultChildren(const std::vector<std::string>& defau
 }
 
 void TreeEvaluator::Evaluate(const FieldView& fields, ModelResult& result) {
-  if (++record_ == UINT32_MAX) {  // the numbering wraps: no code may look current
-    std::fill(codeRecord_.begin(), codeRecord_.end(), UINT32_MAX);
-    record_ = 0;
-  }
-  const Outcome rootOutcome = Check(0, fields);
+  row_.Decode(fields);
+  Walk(Input{row_, fields.Record()}, result);
+}
+
+void TreeEvaluator::Walk(const Input& in, ModelResult& result) {
+  const Outcome rootOutcome = Check(0, in);
   if (rootOutcome == ScoringPredicate::PREDICATE_FALSE) return;
   const bool spreads = strategy_ == MissingStrategy::kWeightedConfidence ||
                        strategy_ == MissingStrategy::kAggregateNodes;
@@ -561,7 +566,7 @@ void TreeEvaluator::Evaluate(const FieldView& fields, ModelResult& result) {
     if (!spreads) return;  // no node decided yet
     branches_.clear();
     branches_.push_back({0, 1.0});
-    FollowBranches(fields, 0, result);
+    FollowBranches(in, 0, result);
     return;
   }
 
@@ -573,7 +578,7 @@ void TreeEvaluator::Evaluate(const FieldView& fields, ModelResult& result) {
     uint32_t next = kNoNode;
     bool stop = false;
     for (uint32_t c = node.firstChild; c < node.endChild && next == kNoNode && !stop; ++c) {
-      const Outcome outcome = Check(c, fields);
+      const Outcome outcome = Check(c, in);
       if (outcome == ScoringPredicate::PREDICATE_TRUE) {
         next = c;
       } else if (outcome == ScoringPredicate::PREDICATE_UNKNOWN) {
@@ -594,8 +599,8 @@ void TreeEvaluator::Evaluate(const FieldView& fields, ModelResult& result) {
           case MissingStrategy::kWeightedConfidence:
           case MissingStrategy::kAggregateNodes:
             branches_.clear();
-            PushBranches(fields, at, c, 1.0);
-            FollowBranches(fields, at, result);
+            PushBranches(in, at, c, 1.0);
+            FollowBranches(in, at, result);
             return;
         }
       }
@@ -647,12 +652,12 @@ void TreeEvaluator::Decide(uint32_t index, int missing, ModelResult& result) con
 
 // Pushes the branch `first` of `parent` and every later sibling whose predicate is not
 // false. weightedConfidence shares `weight` among them by their record counts.
-void TreeEvaluator::PushBranches(const FieldView& fields, uint32_t parent, uint32_t first,
+void TreeEvaluator::PushBranches(const Input& in, uint32_t parent, uint32_t first,
                                  double weight) {
   const size_t start = branches_.size();
   branches_.push_back({first, weights_[first]});
   for (uint32_t c = first + 1; c < nodes_[parent].endChild; ++c) {
-    if (Check(c, fields) != ScoringPredicate::PREDICATE_FALSE) {
+    if (Check(c, in) != ScoringPredicate::PREDICATE_FALSE) {
       branches_.push_back({c, weights_[c]});
     }
   }
@@ -668,7 +673,7 @@ void TreeEvaluator::PushBranches(const FieldView& fields, uint32_t parent, uint3
 // true child under returnLastPrediction) and combines them: weightedConfidence by the
 // branch weights, aggregateNodes by the record counts. `entity` is the node where the
 // record's path divided.
-void TreeEvaluator::FollowBranches(const FieldView& fields, uint32_t entity,
+void TreeEvaluator::FollowBranches(const Input& in, uint32_t entity,
                                    ModelResult& result) {
   std::fill(sumProbabilities_.begin(), sumProbabilities_.end(), 0.0);
   std::fill(sumConfidences_.begin(), sumConfidences_.end(), 0.0);
@@ -687,13 +692,13 @@ void TreeEvaluator::FollowBranches(const FieldView& fields, uint32_t entity,
       uint32_t next = kNoNode;
       bool divided = false;
       for (uint32_t c = node.firstChild; c < node.endChild; ++c) {
-        const Outcome outcome = Check(c, fields);
+        const Outcome outcome = Check(c, in);
         if (outcome == ScoringPredicate::PREDICATE_TRUE) {
           next = c;
           break;
         }
         if (outcome == ScoringPredicate::PREDICATE_UNKNOWN) {
-          PushBranches(fields, at, c, branch.weight);
+          PushBranches(in, at, c, branch.weight);
           divided = true;
           break;
         }
