@@ -15,6 +15,8 @@ bool ModelEvaluator::Rebase(const std::vector<int>&, const std::vector<int>&) { 
 
 void ModelEvaluator::EvaluateRow(FieldRow&, const ValueRecord&, ModelResult&) {}
 
+void ModelEvaluator::DecideStep(uint32_t, ModelResult&) {}
+
 void KindRegistry::Add(const std::string& element, EvaluatorCompiler compiler) {
   for (auto& kind : kinds_) {
     if (kind.first == element) {
@@ -267,6 +269,13 @@ bool CompiledModel::JoinRow(FieldRow& shared, ModelContext& parent) {
 const ModelResult& CompiledModel::ScoreRow(FieldRow& row, const ValueRecord& input) {
   result_.Reset(categories_ != nullptr ? categories_->Size() : 0);
   evaluator_->EvaluateRow(row, input, result_);
+  targets_.Finish(result_);
+  return result_;
+}
+
+const ModelResult& CompiledModel::ScoreStep(uint32_t node) {
+  result_.Reset(categories_ != nullptr ? categories_->Size() : 0);
+  evaluator_->DecideStep(node, result_);
   targets_.Finish(result_);
   return result_;
 }

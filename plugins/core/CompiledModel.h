@@ -30,6 +30,7 @@
 #include "Categories.h"
 #include "FieldBinder.h"
 #include "FieldRow.h"
+#include "StepTree.h"
 #include "MiningSchema.h"
 #include "ModelResult.h"
 #include "OutputFields.h"
@@ -73,6 +74,11 @@ class ModelEvaluator {
   // Evaluate, over the ensemble's row decoded from `record`.
   virtual void EvaluateRow(FieldRow& row, const QZCommon_800::ValueRecord& record,
                            ModelResult& result);
+  // Evaluators that can give their decision as a StepTree over their row (after
+  // Rebase, over the ensemble's): the tree; null otherwise.
+  virtual const StepTree* Steps() const { return nullptr; }
+  // The result of the node a StepTree walk ended on (kDecidesNothing: none).
+  virtual void DecideStep(uint32_t node, ModelResult& result);
 };
 
 // Compiles one model element into its evaluator; throws CompileError when it refuses
@@ -256,6 +262,12 @@ class CompiledModel {
   bool JoinRow(FieldRow& shared, ModelContext& parent);
   // Score for a model that joined a row, decoded from `input`.
   const ModelResult& ScoreRow(FieldRow& row, const QZCommon_800::ValueRecord& input);
+  // The evaluator's StepTree (null when it has none) and Score for a model that joined
+  // a row whose fields are plain for that tree, given the node the walk ended on.
+  const StepTree* Steps() const { return evaluator_->Steps(); }
+  const ModelResult& ScoreStep(uint32_t node);
+  // Whether Targets change the evaluator's results.
+  bool HasTargets() const { return targets_.Active(); }
 
   // The model's OutputFields.
   OutputStage& Output() { return output_; }

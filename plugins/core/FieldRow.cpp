@@ -12,9 +12,15 @@ int FieldRow::AddNumber(int slot, const QZXML_800::IQZEncoder* encoder) {
     return numbers_[i].encoder == encoder ? static_cast<int>(i) : -1;
   }
   numbers_.push_back({slot, encoder});
-  values_.push_back(std::numeric_limits<double>::quiet_NaN());
   states_.push_back(kMissing);
+  Pad();
   return static_cast<int>(numbers_.size() - 1);
+}
+
+void FieldRow::Pad() {
+  const size_t size = std::max<size_t>({numbers_.size(), categories_.size(), 1});
+  values_.resize(size, std::numeric_limits<double>::quiet_NaN());
+  codes_.resize(size, kUnknown);
 }
 
 int FieldRow::AddCategory(int slot, const QZXML_800::IQZVariable* variable) {
@@ -23,7 +29,7 @@ int FieldRow::AddCategory(int slot, const QZXML_800::IQZVariable* variable) {
     return categories_[i].variable == variable ? static_cast<int>(i) : -1;
   }
   categories_.push_back({slot, variable, memo_->Add(variable)});
-  codes_.push_back(kUnknown);
+  Pad();
   return static_cast<int>(categories_.size() - 1);
 }
 
@@ -31,6 +37,7 @@ void FieldRow::Decode(const FieldView& fields) noexcept {
   record_ = &fields.Record();
   binder_ = &fields.Binder();
   constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
+  uint64_t odd = 0;
   for (size_t i = 0; i < numbers_.size(); ++i) {
     const QZCommon_800::Value& value = fields.Get(numbers_[i].slot);
     double x = kNaN;
@@ -52,7 +59,9 @@ void FieldRow::Decode(const FieldView& fields) noexcept {
     }
     values_[i] = x;
     states_[i] = state;
+    if (state != kNumber && i < 64) odd |= uint64_t{1} << i;
   }
+  odd_ = odd;
   std::fill(codes_.begin(), codes_.end(), kUnknown);
 }
 

@@ -55,9 +55,18 @@ class FieldRow {
   void Decode(const FieldView& fields) noexcept;
 
   double Number(int index) const { return values_[static_cast<size_t>(index)]; }
+  // Bit i set: number i (of the first 64) is not kNumber.
+  uint64_t OddNumbers() const { return odd_; }
   NumberState State(int index) const {
     return static_cast<NumberState>(states_[static_cast<size_t>(index)]);
   }
+  // The numbers by index, for loops that read many.
+  const double* NumberData() const { return values_.data(); }
+  // The category codes by index, valid for the fields Code has been asked about since
+  // the last Decode. Both arrays have an entry at every index below the larger of
+  // Numbers() and Categories() (and at least one), so that a loop may read either at
+  // an index meant for the other.
+  const int* CodeData() const { return codes_.data(); }
   // The ScoringPredicate::CategoryCode of a categorical field's value.
   int Code(int index) noexcept {
     int& code = codes_[static_cast<size_t>(index)];
@@ -79,6 +88,7 @@ class FieldRow {
   };
 
   int LookUp(int index) noexcept;
+  void Pad();
 
   CategoryCodeMemo* memo_;
   std::vector<NumberField> numbers_;
@@ -86,6 +96,7 @@ class FieldRow {
   // The record being decoded, for the category codes.
   const QZCommon_800::ValueRecord* record_ = nullptr;
   const FieldBinder* binder_ = nullptr;
+  uint64_t odd_ = ~uint64_t{0};
   std::vector<double> values_;
   std::vector<uint8_t> states_;
   std::vector<int> codes_;

@@ -41,6 +41,9 @@ class TargetStage {
     }
   }
 
+  // Whether some treatment changes results (beyond making -0 +0).
+  bool Active() const { return active_; }
+
   // The displayValue of a category's TargetValue, null when it declares none.
   const std::string* DisplayValue(int category) const;
 

@@ -66,6 +66,8 @@ struct Segment {
   std::string id;           // the Segment's id, else its 1-based position
   bool compatible = false;  // predicts the mining model's target in its terms
   bool joined = false;      // reads the mining model's row (CompiledModel::JoinRow)
+  int step = -1;            // its StepTree's index in the walk of the shallow trees
+  const double* values = nullptr;  // a regression StepTree's node scores, when final
   std::unique_ptr<CompiledModel> model;
 
   bool Selected(const ValueRecord& record) const {
@@ -132,6 +134,8 @@ class MiningEvaluator : public ModelEvaluator {
 
   void Combine(const ValueRecord& record, ModelResult& result);
   bool Contribute(const ModelResult& segment, double weight);
+  bool ContributeValue(double value, double weight);
+  bool SumSteps(ModelResult& result) const;
   void FinishRegression(ModelResult& result);
   void FinishClassification(double missingVotes, ModelResult& result);
   void SelectFirst(const ValueRecord& record, ModelResult& result);
@@ -156,6 +160,14 @@ class MiningEvaluator : public ModelEvaluator {
   // The fields of the segments that joined it, decoded once per record for all of them.
   FieldRow row_;
   bool joined_ = false;
+  // The shallow trees among them, walked side by side for every record.
+  std::vector<const StepTree*> stepTrees_;
+  std::vector<uint8_t> plain_;     // per step tree: the record's fields are plain for it
+  std::vector<uint32_t> decides_;  // per step tree: the node its walk ended on
+  // Sums and averages of regression trees that are all walked side by side and always
+  // used: the sum over the walks' scores, with the weight every record uses.
+  bool sumsSteps_ = false;
+  double usedWeight_ = 0.0;
 
   // Per-record scratch; capacities are reserved at compile time or on the first record.
   std::vector<double> values_;   // regression: one prediction per contributing segment
@@ -253,6 +265,26 @@ MiningEvaluator::MiningEvaluator(ModelContext& context)
       segment.joined = segment.model->JoinRow(row_, context);
       joined_ = joined_ || segment.joined;
     }
+  }
+  // Combining methods score every used segment: their shallow trees are walked side by
+  // side.
+  const bool combines = method_ != Method::kSelectFirst && method_ != Method::kSelectAll &&
+                        method_ != Method::kModelChain;
+  for (Segment& segment : segments_) {
+    const StepTree* steps = combines && segment.joined ? segment.model->Steps() : nullptr;
+    if (steps == nullptr) continue;
+    segment.step = static_cast<int>(stepTrees_.size());
+    stepTrees_.push_back(steps);
+    if (!classification_ && !segment.model->HasTargets()) segment.values = steps->Values();
+  }
+  plain_.resize(stepTrees_.size());
+  decides_.resize(stepTrees_.size());
+  sumsSteps_ = !classification_ && (method_ == Method::kSum || method_ == Method::kAverage ||
+                                    method_ == Method::kWeightedSum ||
+                                    method_ == Method::kWeightedAverage);
+  for (const Segment& segment : segments_) {
+    sumsSteps_ = sumsSteps_ && segment.selector == Selector::kTrue && segment.values != nullptr;
+    usedWeight_ += weighted_ ? segment.weight : 1.0;
   }
   values_.reserve(segments_.size());
   weights_.reserve(segments_.size());
@@ -394,18 +426,35 @@ void MiningEvaluator::Combine(const ValueRecord& record, ModelResult& result) {
   dists_.clear();
   width_ = result.probabilities.size();
   const bool voting = method_ == Method::kMajorityVote || method_ == Method::kWeightedMajorityVote;
+  if (!stepTrees_.empty()) {
+    for (size_t t = 0; t < stepTrees_.size(); ++t) plain_[t] = stepTrees_[t]->Plain(row_);
+    StepTree::WalkTogether(stepTrees_.data(), stepTrees_.size(), row_, decides_.data());
+    if (sumsSteps_ && SumSteps(result)) return;
+  }
   double used = 0.0, missing = 0.0;
   for (const Segment& segment : segments_) {
     if (!segment.Selected(record)) continue;
-    const ModelResult& r = ScoreSegment(segment, record);
-    if (r.state == ModelResult::kInvalid) {
-      result.state = ModelResult::kInvalid;
-      result.error = r.error;
-      return;
-    }
     const double weight = weighted_ ? segment.weight : 1.0;
+    bool contributed;
+    if (segment.step >= 0 && plain_[static_cast<size_t>(segment.step)] != 0) {
+      const uint32_t node = decides_[static_cast<size_t>(segment.step)];
+      if (segment.values != nullptr) {
+        contributed = ContributeValue(
+            node == StepTree::kDecidesNothing ? kNaN : segment.values[node], weight);
+      } else {
+        contributed = Contribute(segment.model->ScoreStep(node), weight);
+      }
+    } else {
+      const ModelResult& r = ScoreSegment(segment, record);
+      if (r.state == ModelResult::kInvalid) {
+        result.state = ModelResult::kInvalid;
+        result.error = r.error;
+        return;
+      }
+      contributed = Contribute(r, weight);
+    }
     used += weight;
-    if (!Contribute(r, weight)) {
+    if (!contributed) {
       missing += weight;
       if (missing_ == MissingPrediction::kReturnMissing) return;
       // Continuing with a missing number leaves the combination missing.
@@ -422,12 +471,7 @@ void MiningEvaluator::Combine(const ValueRecord& record, ModelResult& result) {
 
 bool MiningEvaluator::Contribute(const ModelResult& r, double weight) {
   if (r.state != ModelResult::kValue) return false;
-  if (!classification_) {
-    if (std::isnan(r.value)) return false;
-    values_.push_back(r.value);
-    weights_.push_back(weight);
-    return true;
-  }
+  if (!classification_) return ContributeValue(r.value, weight);
   if (r.category < 0 || static_cast<size_t>(r.category) >= width_) return false;
   weights_.push_back(weight);
   if (method_ == Method::kMajorityVote || method_ == Method::kWeightedMajorityVote) {
@@ -440,6 +484,38 @@ bool MiningEvaluator::Contribute(const ModelResult& r, double weight) {
     dists_.resize(dists_.size() + width_, 0.0);
     dists_[dists_.size() - width_ + static_cast<size_t>(r.category)] = 1.0;
   }
+  return true;
+}
+
+// Combine for sumsSteps_, in the same order of operations: false, with the result
+// untouched, when a walk did not reach a score (the general loop then decides).
+bool MiningEvaluator::SumSteps(ModelResult& result) const {
+  double value = 0.0, total = 0.0;
+  for (size_t t = 0; t < segments_.size(); ++t) {
+    const uint32_t node = decides_[t];
+    if (plain_[t] == 0 || node == StepTree::kDecidesNothing) return false;
+    const double v = segments_[t].values[node];
+    if (std::isnan(v)) return false;
+    if (weighted_) {
+      value += segments_[t].weight * v;
+      total += segments_[t].weight;
+    } else {
+      value += v;
+    }
+  }
+  if (0.0 > missingThreshold_ * usedWeight_) return true;  // as Combine: missing
+  if (method_ == Method::kAverage) value /= static_cast<double>(segments_.size());
+  if (method_ == Method::kWeightedAverage) value = total != 0.0 ? value / total : kNaN;
+  if (std::isnan(value)) return true;
+  result.value = value;
+  result.state = ModelResult::kValue;
+  return true;
+}
+
+bool MiningEvaluator::ContributeValue(double value, double weight) {
+  if (std::isnan(value)) return false;
+  values_.push_back(value);
+  weights_.push_back(weight);
   return true;
 }
 

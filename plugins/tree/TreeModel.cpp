@@ -21,6 +21,7 @@
 #include "ScoringSetPredicate.h"
 #include "ScoringSimplePredicate.h"
 #include "ScoringTruePredicate.h"
+#include "StepTree.h"
 
 namespace QZPlugin_800 {
 
@@ -181,6 +182,10 @@ class TreeEvaluator : public ModelEvaluator {
   explicit TreeEvaluator(ModelContext& context);
   void Evaluate(const FieldView& fields, ModelResult& result) override;
   FieldRow* Row() override { return &row_; }
+  const StepTree* Steps() const override { return steps_.Empty() ? nullptr : &steps_; }
+  void DecideStep(uint32_t node, ModelResult& result) override {
+    if (node != StepTree::kDecidesNothing) Decide(node, 0, result);
+  }
   bool Rebase(const std::vector<int>& numbers, const std::vector<int>& categories) override;
   void EvaluateRow(FieldRow& row, const QZCommon_800::ValueRecord& record,
                    ModelResult& result) override {
@@ -250,6 +255,7 @@ class TreeEvaluator : public ModelEvaluator {
     return true;
   }
   void Walk(const Input& in, ModelResult& result);
+  void CompileSteps();
   void Decide(uint32_t index, int missing, ModelResult& result) const;
   void PushBranches(const Input& in, uint32_t parent, uint32_t first, double weight);
   void FollowBranches(const Input& in, uint32_t entity, ModelResult& result);
@@ -278,6 +284,11 @@ class TreeEvaluator : public ModelEvaluator {
   std::vector<double> rows_;
   // Per distribution row, `categories_` record counts (for aggregateNodes).
   std::vector<double> counts_;
+
+  // The tree as a branch-free walk, for ensembles of shallow trees; empty for a tree
+  // deeper than StepTree::kShallow or a test that can give more than true and false
+  // for plain values.
+  StepTree steps_;
 
   // The scratch of weightedConfidence and aggregateNodes, sized at compile time.
   std::vector<Branch> branches_;
@@ -331,6 +342,62 @@ TreeEvaluator::TreeEvaluator(ModelContext& context)
   defaultChildren_.assign(nodes_.size(), kNoNode);
   if (strategy_ == MissingStrategy::kDefaultChild) ResolveDefaultChildren(defaults);
   branches_.reserve(nodes_.size());
+  CompileSteps();
+}
+
+// Builds the branch-free walk when every test gives true or false for plain values:
+// constants, numeric tests whose results in and out of the range are true or false,
+// and category tests. Missing values are left to the full walk, so the missing value
+// strategy never applies to it.
+void TreeEvaluator::CompileSteps() {
+  StepTree steps;
+  std::vector<uint32_t> parents(nodes_.size(), kNoNode);
+  std::vector<int> depths(nodes_.size(), 1);  // the steps a walk takes to reach a node
+  for (uint32_t i = 0; i < nodes_.size(); ++i) {
+    for (uint32_t c = nodes_[i].firstChild; c < nodes_[i].endChild; ++c) {
+      parents[c] = i;
+      depths[c] = depths[i] + static_cast<int>(c - nodes_[i].firstChild) + 1;
+    }
+  }
+  constexpr auto kTrue = ScoringPredicate::PREDICATE_TRUE;
+  constexpr auto kFalse = ScoringPredicate::PREDICATE_FALSE;
+  for (uint32_t i = 0; i < nodes_.size(); ++i) {
+    const Node& node = nodes_[i];
+    StepTree::Node step;
+    int count = 64;
+    if (node.test == Test::kAlways || node.test == Test::kNever) {
+      step = StepTree::Constant(node.test == Test::kAlways);
+    } else if (node.test == Test::kNumeric) {
+      const auto in = static_cast<Outcome>((node.form >> 4) & 3);
+      const auto out = static_cast<Outcome>((node.form >> 6) & 3);
+      if ((in != kTrue && in != kFalse) || (out != kTrue && out != kFalse)) return;
+      step = StepTree::Number(node.field, node.numeric.low, (node.form & 1) != 0,
+                              node.numeric.high, (node.form & 2) != 0, in == kTrue,
+                              out == kTrue);
+    } else if (node.test == Test::kCategory) {
+      step = StepTree::Category(node.field, node.category.members);
+      count = node.category.count;
+    } else {
+      return;
+    }
+    // True: on to the first child, or this node decides. False: on to the next
+    // sibling, or the parent decides when it may (returnLastPrediction), else nothing.
+    step.next[1] = node.firstChild < node.endChild ? node.firstChild : (i | StepTree::kEnd);
+    const uint32_t parent = parents[i];
+    if (parent != kNoNode && i + 1 < nodes_[parent].endChild) {
+      step.next[0] = i + 1;
+    } else {
+      step.next[0] = (parent != kNoNode && returnLast_ ? parent : StepTree::kDecidesNothing) |
+                     StepTree::kEnd;
+    }
+    steps.Add(step, depths[i], count);
+  }
+  if (nodes_.size() >= StepTree::kDecidesNothing / 2 || steps.Depth() > StepTree::kShallow) {
+    return;
+  }
+  steps.Finish();
+  if (!classification_) steps.SetValues(scores_.data());
+  steps_ = std::move(steps);
 }
 
 void TreeEvaluator::CompileNode(ModelContext& context, uint32_t index,
@@ -473,6 +540,7 @@ bool TreeEvaluator::Rebase(const std::vector<int>& numbers, const std::vector<in
       node.field = static_cast<uint16_t>(categories[node.field]);
     }
   }
+  steps_.Rebase(numbers, categories);
   return true;
 }
 
