@@ -68,6 +68,7 @@ void StepTree::Track(const Node& node, int count) {
       return;
     }
     categories_.push_back({node.field, count});
+    if (node.field < 64) categoryMask_ |= uint64_t{1} << node.field;
     return;
   }
   if (IsConstant(node)) return;  // reads no field
@@ -82,6 +83,7 @@ void StepTree::Track(const Node& node, int count) {
 void StepTree::Rebase(const std::vector<int>& numbers, const std::vector<int>& categories) {
   const std::vector<CategoryField> counts = categories_;
   numberMask_ = 0;
+  categoryMask_ = 0;
   wideNumbers_.clear();
   categories_.clear();
   for (Node& node : nodes_) {
@@ -123,6 +125,45 @@ void StepTree::WalkTogether(const StepTree* const* trees, size_t count, const Fi
           at[k] >= tree.ends_ ? tree.decisions_[at[k] - tree.ends_] : kDecidesNothing;
     }
   }
+}
+
+void StepForest::Add(const StepTree* tree) {
+  trees_.push_back(tree);
+  plain_.push_back(0);
+  decides_.push_back(StepTree::kDecidesNothing);
+  numbers_ |= tree->numberMask_;
+  categories_ |= tree->categoryMask_;
+  wide_ = wide_ || !tree->wideNumbers_.empty();
+  for (const StepTree::CategoryField& category : tree->categories_) {
+    wide_ = wide_ || category.field >= 64;
+    auto found = std::find_if(limits_.begin(), limits_.end(),
+                              [&](const StepTree::CategoryField& c) {
+                                return c.field == category.field;
+                              });
+    if (found == limits_.end()) {
+      limits_.push_back(category);
+    } else {
+      found->count = std::min(found->count, category.count);
+    }
+  }
+}
+
+void StepForest::Walk(FieldRow& row) {
+  const uint64_t oddNumbers = row.OddNumbers();
+  uint64_t oddCodes = 0;
+  for (const StepTree::CategoryField& limit : limits_) {
+    const int code = row.Code(limit.field);  // every code the walks read
+    if (limit.field < 64 && (code < 0 || code >= limit.count)) {
+      oddCodes |= uint64_t{1} << limit.field;
+    }
+  }
+  allPlain_ = !wide_ && ((numbers_ & oddNumbers) | (categories_ & oddCodes)) == 0;
+  if (!allPlain_) {
+    for (size_t t = 0; t < trees_.size(); ++t) {
+      plain_[t] = trees_[t]->Plain(row, oddNumbers, oddCodes) ? 1 : 0;
+    }
+  }
+  StepTree::WalkTogether(trees_.data(), trees_.size(), row, decides_.data());
 }
 
 }  // namespace QZPlugin_800

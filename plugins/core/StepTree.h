@@ -70,13 +70,16 @@ class StepTree {
   void Rebase(const std::vector<int>& numbers, const std::vector<int>& categories);
 
   // Whether every field the tests read is plain in the row: then the walk gives what
-  // the tree's full walk gives. Asks the row for the category codes the walk reads.
-  bool Plain(FieldRow& row) const {
-    if ((numberMask_ & row.OddNumbers()) != 0) return false;
+  // the tree's full walk gives. `oddNumbers` is the row's OddNumbers(); `oddCodes` has
+  // bit i set when category i's code is not below every count that category's tests
+  // cover (StepForest works it out). Fields from 64 on are checked one by one.
+  bool Plain(FieldRow& row, uint64_t oddNumbers, uint64_t oddCodes) const {
+    if (((numberMask_ & oddNumbers) | (categoryMask_ & oddCodes)) != 0) return false;
     for (uint16_t field : wideNumbers_) {
       if (row.State(field) != FieldRow::kNumber) return false;
     }
     for (const CategoryField& category : categories_) {
+      if (category.field < 64) continue;
       const int code = row.Code(category.field);
       if (code < 0 || code >= category.count) return false;
     }
@@ -84,12 +87,14 @@ class StepTree {
   }
 
   // Walks `count` trees together over the row and stores the node that decides each
-  // (or kDecidesNothing) in `decides`. Plain must have been asked of every tree first;
-  // a tree whose row is not plain gets an answer that means nothing.
+  // (or kDecidesNothing) in `decides`. The category codes the trees read must have been
+  // asked of the row; a tree whose row is not plain gets an answer that means nothing.
   static void WalkTogether(const StepTree* const* trees, size_t count, const FieldRow& row,
                            uint32_t* decides);
 
  private:
+  friend class StepForest;
+
   struct CategoryField {
     uint16_t field;
     int count;  // the fewest categories a test on the field covers
@@ -123,9 +128,37 @@ class StepTree {
   uint32_t ends_ = 0;                // the first end node
   int depth_ = 0;
   uint64_t numberMask_ = 0;            // the numbers below 64 the tests read
+  uint64_t categoryMask_ = 0;          // the categories below 64 the tests read
   std::vector<uint16_t> wideNumbers_;  // and those from 64 on
   std::vector<CategoryField> categories_;
   const double* values_ = nullptr;
+};
+
+// The trees of one ensemble that are walked side by side, over the ensemble's row.
+// Per record Walk finds which trees the record's fields are plain for (with one test
+// for all of them when every field is) and walks every tree; the answers of the others
+// mean nothing.
+class StepForest {
+ public:
+  void Add(const StepTree* tree);
+  size_t Size() const { return trees_.size(); }
+  const StepTree& Tree(size_t index) const { return *trees_[index]; }
+
+  void Walk(FieldRow& row);
+  bool Plain(size_t index) const { return allPlain_ || plain_[index] != 0; }
+  // The node that decides tree `index`, or StepTree::kDecidesNothing.
+  uint32_t Decides(size_t index) const { return decides_[index]; }
+
+ private:
+  std::vector<const StepTree*> trees_;
+  uint64_t numbers_ = 0;     // the numbers below 64 any tree reads
+  uint64_t categories_ = 0;  // likewise the categories
+  bool wide_ = false;        // some tree reads a field from 64 on
+  // Each category a tree reads, with the fewest categories any test on it covers.
+  std::vector<StepTree::CategoryField> limits_;
+  bool allPlain_ = false;
+  std::vector<uint8_t> plain_;
+  std::vector<uint32_t> decides_;
 };
 
 }  // namespace QZPlugin_800

@@ -161,9 +161,7 @@ class MiningEvaluator : public ModelEvaluator {
   FieldRow row_;
   bool joined_ = false;
   // The shallow trees among them, walked side by side for every record.
-  std::vector<const StepTree*> stepTrees_;
-  std::vector<uint8_t> plain_;     // per step tree: the record's fields are plain for it
-  std::vector<uint32_t> decides_;  // per step tree: the node its walk ended on
+  StepForest forest_;
   // Sums and averages of regression trees that are all walked side by side and always
   // used: the sum over the walks' scores, with the weight every record uses.
   bool sumsSteps_ = false;
@@ -273,12 +271,10 @@ MiningEvaluator::MiningEvaluator(ModelContext& context)
   for (Segment& segment : segments_) {
     const StepTree* steps = combines && segment.joined ? segment.model->Steps() : nullptr;
     if (steps == nullptr) continue;
-    segment.step = static_cast<int>(stepTrees_.size());
-    stepTrees_.push_back(steps);
+    segment.step = static_cast<int>(forest_.Size());
+    forest_.Add(steps);
     if (!classification_ && !segment.model->HasTargets()) segment.values = steps->Values();
   }
-  plain_.resize(stepTrees_.size());
-  decides_.resize(stepTrees_.size());
   sumsSteps_ = !classification_ && (method_ == Method::kSum || method_ == Method::kAverage ||
                                     method_ == Method::kWeightedSum ||
                                     method_ == Method::kWeightedAverage);
@@ -426,9 +422,8 @@ void MiningEvaluator::Combine(const ValueRecord& record, ModelResult& result) {
   dists_.clear();
   width_ = result.probabilities.size();
   const bool voting = method_ == Method::kMajorityVote || method_ == Method::kWeightedMajorityVote;
-  if (!stepTrees_.empty()) {
-    for (size_t t = 0; t < stepTrees_.size(); ++t) plain_[t] = stepTrees_[t]->Plain(row_);
-    StepTree::WalkTogether(stepTrees_.data(), stepTrees_.size(), row_, decides_.data());
+  if (forest_.Size() > 0) {
+    forest_.Walk(row_);
     if (sumsSteps_ && SumSteps(result)) return;
   }
   double used = 0.0, missing = 0.0;
@@ -436,8 +431,8 @@ void MiningEvaluator::Combine(const ValueRecord& record, ModelResult& result) {
     if (!segment.Selected(record)) continue;
     const double weight = weighted_ ? segment.weight : 1.0;
     bool contributed;
-    if (segment.step >= 0 && plain_[static_cast<size_t>(segment.step)] != 0) {
-      const uint32_t node = decides_[static_cast<size_t>(segment.step)];
+    if (segment.step >= 0 && forest_.Plain(static_cast<size_t>(segment.step))) {
+      const uint32_t node = forest_.Decides(static_cast<size_t>(segment.step));
       if (segment.values != nullptr) {
         contributed = ContributeValue(
             node == StepTree::kDecidesNothing ? kNaN : segment.values[node], weight);
@@ -492,8 +487,8 @@ bool MiningEvaluator::Contribute(const ModelResult& r, double weight) {
 bool MiningEvaluator::SumSteps(ModelResult& result) const {
   double value = 0.0, total = 0.0;
   for (size_t t = 0; t < segments_.size(); ++t) {
-    const uint32_t node = decides_[t];
-    if (plain_[t] == 0 || node == StepTree::kDecidesNothing) return false;
+    const uint32_t node = forest_.Decides(t);
+    if (!forest_.Plain(t) || node == StepTree::kDecidesNothing) return false;
     const double v = segments_[t].values[node];
     if (std::isnan(v)) return false;
     if (weighted_) {
