@@ -8,6 +8,8 @@
 #   ./build.sh tsan       the thread stress test under ThreadSanitizer ("tsan all": the suite)
 #   ./build.sh coverage   line coverage of src/ and platform/ over the whole suite (gcovr)
 #   ./build.sh robustness hostile documents and data; rewrites docs/robustness.md
+#   ./build.sh bench [F]  Release build; corpus models through the reference plug-ins
+#                         (records per second, medians of 5), F a benchmark filter
 #
 # Installing packages needs root; as another user the script names the missing packages
 # and stops.
@@ -75,8 +77,14 @@ case "${1:-}" in
     setup
     scripts/robustness.sh "$jobs"
     ;;
+  bench)
+    setup
+    build build-bench -DCMAKE_BUILD_TYPE=Release -DQZSCORING_BUILD_TESTS=OFF
+    build-bench/bin/plugin_bench --benchmark_filter="${2:-.}" \
+      --benchmark_repetitions=5 --benchmark_report_aggregates_only=true
+    ;;
   *)
-    echo "usage: $0 demo|test|sanitize|fuzz [seconds]|tsan [all]|coverage|robustness" >&2
+    echo "usage: $0 demo|test|sanitize|fuzz [seconds]|tsan [all]|coverage|robustness|bench [filter]" >&2
     exit 2
     ;;
 esac

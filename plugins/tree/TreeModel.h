@@ -18,9 +18,12 @@ namespace QZPlugin_800 {
 //
 // The tree is compiled into a flat array of nodes, children consecutive, each holding
 // the plain form of its predicate the library gives (NumericTest, CategoryTest) where
-// it has one, so that scoring reads fields by the model's slots and calls a predicate
-// object only for what those forms leave open. Its evaluator keeps per-record scratch:
-// one thread at a time, like the compiled model that owns it.
+// it has one, so that scoring tests numbers and category codes decoded once per record
+// (a FieldRow) and calls a predicate object only for what those forms leave open. A
+// tree in an ensemble reads the ensemble's row; a shallow one is also compiled as a
+// StepTree, which the ensemble walks side by side with the others for records whose
+// fields are all plain. Its evaluator keeps per-record scratch: one thread at a time,
+// like the compiled model that owns it.
 void RegisterTreeModel(KindRegistry& registry);
 
 }  // namespace QZPlugin_800
