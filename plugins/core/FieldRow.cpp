@@ -33,7 +33,7 @@ int FieldRow::AddCategory(int slot, const QZXML_800::IQZVariable* variable) {
   return static_cast<int>(categories_.size() - 1);
 }
 
-void FieldRow::Decode(const FieldView& fields) noexcept {
+void FieldRow::Decode(const FieldView& fields) {
   record_ = &fields.Record();
   binder_ = &fields.Binder();
   constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();

@@ -28,7 +28,7 @@ class FieldRow {
     kOther        // neither number nor null: only the predicate itself can judge it
   };
 
-  explicit FieldRow(CategoryCodeMemo& memo) : memo_(&memo) {}
+  explicit FieldRow(CategoryCodeMemo& memo) : memo_(&memo) { Pad(); }
   FieldRow(const FieldRow&) = delete;
   FieldRow& operator=(const FieldRow&) = delete;
 
@@ -51,8 +51,8 @@ class FieldRow {
   }
 
   // Decodes the numeric fields of the record `fields` shows; category codes are worked
-  // out on first use. Allocates nothing. Never throws.
-  void Decode(const FieldView& fields) noexcept;
+  // out on first use. Allocates nothing.
+  void Decode(const FieldView& fields);
 
   double Number(int index) const { return values_[static_cast<size_t>(index)]; }
   // Bit i set: number i (of the first 64) is not kNumber.

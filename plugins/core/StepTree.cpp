@@ -9,7 +9,9 @@ namespace QZPlugin_800 {
 
 StepTree::Node StepTree::Constant(bool holds) {
   constexpr double kInfinity = std::numeric_limits<double>::infinity();
-  return Number(0, -kInfinity, true, kInfinity, true, holds, holds);
+  Node node = Number(0, -kInfinity, true, kInfinity, true, holds, holds);
+  node.form &= static_cast<uint8_t>(~kReadsField);
+  return node;
 }
 
 StepTree::Node StepTree::Number(uint16_t field, double low, bool lowIncluded, double high,
@@ -21,7 +23,7 @@ StepTree::Node StepTree::Number(uint16_t field, double low, bool lowIncluded, do
   node.range.high = highIncluded ? high : std::nextafter(high, -kInfinity);
   node.field = field;
   node.kind = kNumber;
-  node.form = static_cast<uint8_t>((outOfRange ? 1 : 0) | (inRange ? 2 : 0));
+  node.form = static_cast<uint8_t>((outOfRange ? 1 : 0) | (inRange ? 2 : 0) | kReadsField);
   return node;
 }
 

@@ -43,7 +43,10 @@ class StepTree {
     uint32_t next[2];    // [test false, test true]
     uint16_t field;      // the number's or the category code's index in the row
     Kind kind;
-    uint8_t form;        // kNumber: bit 0 the result out of the range, bit 1 in it
+    // kNumber: bit 0 the result out of the range, bit 1 in it, bit 4 set when the test
+    // reads its field (all but constants: a test whose results are alike for every
+    // number, such as isMissing, still needs the field plain).
+    uint8_t form;
   };
 
   static Node Constant(bool holds);
@@ -116,8 +119,9 @@ class StepTree {
     }
     return node.next[holds];
   }
+  static constexpr uint8_t kReadsField = 16;
   static bool IsConstant(const Node& node) {
-    return node.kind == kNumber && (node.form == 0 || node.form == 3);
+    return node.kind == kNumber && (node.form & kReadsField) == 0;
   }
 
   void Track(const Node& node, int count);

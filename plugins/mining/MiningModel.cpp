@@ -163,9 +163,8 @@ class MiningEvaluator : public ModelEvaluator {
   // The shallow trees among them, walked side by side for every record.
   StepForest forest_;
   // Sums and averages of regression trees that are all walked side by side and always
-  // used: the sum over the walks' scores, with the weight every record uses.
+  // used: the sum over the walks' scores.
   bool sumsSteps_ = false;
-  double usedWeight_ = 0.0;
 
   // Per-record scratch; capacities are reserved at compile time or on the first record.
   std::vector<double> values_;   // regression: one prediction per contributing segment
@@ -280,7 +279,6 @@ MiningEvaluator::MiningEvaluator(ModelContext& context)
                                     method_ == Method::kWeightedAverage);
   for (const Segment& segment : segments_) {
     sumsSteps_ = sumsSteps_ && segment.selector == Selector::kTrue && segment.values != nullptr;
-    usedWeight_ += weighted_ ? segment.weight : 1.0;
   }
   values_.reserve(segments_.size());
   weights_.reserve(segments_.size());
@@ -456,7 +454,9 @@ void MiningEvaluator::Combine(const ValueRecord& record, ModelResult& result) {
       if (missing_ == MissingPrediction::kContinue && !voting) return;
     }
   }
-  if (missing > missingThreshold_ * used) return;
+  // The share of missing weight, once something is missing (total weights may be
+  // negative).
+  if (missing != 0.0 && missing > missingThreshold_ * used) return;
   if (classification_) {
     FinishClassification(missing_ == MissingPrediction::kContinue ? missing : 0.0, result);
   } else {
@@ -498,7 +498,6 @@ bool MiningEvaluator::SumSteps(ModelResult& result) const {
       value += v;
     }
   }
-  if (0.0 > missingThreshold_ * usedWeight_) return true;  // as Combine: missing
   if (method_ == Method::kAverage) value /= static_cast<double>(segments_.size());
   if (method_ == Method::kWeightedAverage) value = total != 0.0 ? value / total : kNaN;
   if (std::isnan(value)) return true;
