@@ -18,13 +18,14 @@
 
 #include <benchmark/benchmark.h>
 
-#include "QZMV.h"
 #include "QZSettings.h"
 #include "QZVarList.h"
 #include "ScoringFactory.h"
 #include "ScoringModel.h"
 #include "Value.h"
 #include "ValueRecord.h"
+#include "CorpusText.h"
+#include "ReferenceRegistry.h"
 
 using QZCommon_800::Value;
 using QZCommon_800::ValueRecord;
@@ -37,39 +38,6 @@ namespace {
 std::string CorpusDir() {
   const char* dir = std::getenv("QZSCORING_CORPUS_DIR");
   return dir != nullptr && *dir != '\0' ? dir : QZ_CORPUS_DIR;
-}
-
-QZSettings Registry() {
-  QZSettings scoring, models, settings;
-  scoring.AddSetting("TreeModel", "QZTree", false);
-  scoring.AddSetting("RegressionModel", "QZRegression", false);
-  scoring.AddSetting("MiningModel", "QZMining", false);
-  scoring.AddSetting("Veritor", "QZMining", false);
-  for (const char* kind : {"MiningModel", "TreeModel", "RegressionModel"}) {
-    models.AddSetting(kind, "", false);
-  }
-  settings.AddSetting("scoringDll", scoring, true);
-  settings.AddSetting("modelDll", models, true);
-  return settings;
-}
-
-std::vector<std::string> SplitCsv(const std::string& line) {
-  std::vector<std::string> cells(1);
-  bool quoted = false;
-  for (size_t i = 0; i < line.size(); ++i) {
-    const char c = line[i];
-    if (c == '"' && quoted && i + 1 < line.size() && line[i + 1] == '"') {
-      cells.back() += '"';
-      ++i;
-    } else if (c == '"') {
-      quoted = !quoted;
-    } else if (c == ',' && !quoted) {
-      cells.emplace_back();
-    } else if (c != '\r') {
-      cells.back() += c;
-    }
-  }
-  return cells;
 }
 
 // A model ready to score, with its records.
@@ -88,7 +56,7 @@ void ReadRecords(const std::string& path, const QZXML_800::QZVarList& variables,
   std::string line;
   if (!std::getline(in, line)) return;
   std::vector<std::pair<size_t, int>> columns;  // CSV column, record position
-  const std::vector<std::string> header = SplitCsv(line);
+  const std::vector<std::string> header = qztest::SplitCsv(line);
   for (size_t c = 0; c < header.size(); ++c) {
     const int position = layout.IndexOf(header[c]);
     bool taken = false;
@@ -97,7 +65,7 @@ void ReadRecords(const std::string& path, const QZXML_800::QZVarList& variables,
   }
   while (std::getline(in, line)) {
     if (line.empty()) continue;
-    const std::vector<std::string> cells = SplitCsv(line);
+    const std::vector<std::string> cells = qztest::SplitCsv(line);
     ValueRecord record = layout;  // a copy shares the layout
     for (const auto& [c, position] : columns) {
       const std::string& cell = c < cells.size() ? cells[c] : std::string();
@@ -105,10 +73,10 @@ void ReadRecords(const std::string& path, const QZXML_800::QZVarList& variables,
       const int storage = variable->GetStorageType();
       const bool numeric = storage != QZXML_800::STORAGE_STRING &&
                            storage != QZXML_800::STORAGE_UNKNOWN;
-      const double number = Value::TextToReal(cell);
+      double number = 0.0;
       if (cell.empty()) {
         record[static_cast<size_t>(position)] = Value();
-      } else if (numeric && !QZCommon_800::QZMV::IsMissing(number)) {
+      } else if (numeric && qztest::ParseNumber(cell, number)) {
         record[static_cast<size_t>(position)] = number;
       } else {
         record[static_cast<size_t>(position)] = cell;
@@ -130,7 +98,7 @@ Loaded Load(const std::string& name, const std::string& table) {
     loaded.error = "cannot unzip " + name + " from " + cpmml;
     return loaded;
   }
-  QZSettings settings = Registry();
+  QZSettings settings = qztest::ReferenceRegistry();
   ScoringFactory factory;
   loaded.model.reset(factory.CreateScoringModel(settings, (dir / (name + ".xml")).string()));
   factory.Detach();
@@ -147,7 +115,7 @@ Loaded Load(const std::string& name, const std::string& table) {
   std::string header;
   std::getline(in, header);
   ValueRecord layout;
-  for (const std::string& column : SplitCsv(header)) {
+  for (const std::string& column : qztest::SplitCsv(header)) {
     const QZXML_800::IQZVariable* variable = variables.GetVariable(column);
     if (variable != nullptr && variable->GetRole() != QZXML_800::ROLE_TARGET &&
         !layout.Contains(column)) {
