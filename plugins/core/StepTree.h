@@ -146,7 +146,6 @@ class StepForest {
  public:
   void Add(const StepTree* tree);
   size_t Size() const { return trees_.size(); }
-  const StepTree& Tree(size_t index) const { return *trees_[index]; }
 
   void Walk(FieldRow& row);
   bool Plain(size_t index) const { return allPlain_ || plain_[index] != 0; }

@@ -11,6 +11,7 @@
 
 #include <gtest/gtest.h>
 
+#include "HostileTransformations.h"
 #include "Value.h"
 #include "ValueRecord.h"
 #include "XercesTestEnvironment.h"
@@ -19,22 +20,7 @@ namespace {
 
 using QZCommon_800::ValueRecord;
 using QZTransformNS_8_0_0::QZTransformation;
-
-// f0(v) = v + 1; f(k)(v) = f(k-1)(v) + f(k-1)(v) for k = 1 .. levels.
-std::string DoublingFunctions(int levels) {
-  std::string text = R"(<DefineFunction name="f0" optype="continuous" dataType="double">
-      <ParameterField name="v"/><Apply function="+"><FieldRef field="v"/><Constant>1</Constant>
-      </Apply></DefineFunction>)";
-  for (int k = 1; k <= levels; ++k) {
-    const std::string previous = "f" + std::to_string(k - 1);
-    text += "<DefineFunction name=\"f" + std::to_string(k) +
-            "\" optype=\"continuous\" dataType=\"double\"><ParameterField name=\"v\"/>"
-            "<Apply function=\"+\"><Apply function=\"" + previous +
-            "\"><FieldRef field=\"v\"/></Apply><Apply function=\"" + previous +
-            "\"><FieldRef field=\"v\"/></Apply></Apply></DefineFunction>";
-  }
-  return text;
-}
+using qztest::DoublingFunctions;
 
 std::string Field(const std::string& name, const std::string& function) {
   return "<DerivedField name=\"" + name + "\" optype=\"continuous\" dataType=\"double\">" +

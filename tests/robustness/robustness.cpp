@@ -41,6 +41,7 @@
 #include <xercesc/util/PlatformUtils.hpp>
 
 #include "Csv.h"
+#include "HostileTransformations.h"
 #include "QZDisplay.h"
 #include "Records.h"
 #include "ReferenceRegistry.h"
@@ -918,20 +919,9 @@ Outcome RegexBacktracking() {
 }
 
 Outcome ExponentialFunctions() {
-  // f0(v) = v + 1, f(k)(v) = f(k-1)(v) + f(k-1)(v): 2^60 calls for f60 if every call is
-  // computed, 60 nested levels.
-  std::string functions = R"(<DefineFunction name="f0" optype="continuous" dataType="double">
-      <ParameterField name="v"/><Apply function="+"><FieldRef field="v"/><Constant>1</Constant>
-      </Apply></DefineFunction>)";
+  // 2^60 calls for f60 if every call is computed, 60 nested levels.
   const int levels = 60;
-  for (int k = 1; k <= levels; ++k) {
-    const std::string previous = "f" + std::to_string(k - 1);
-    functions += "<DefineFunction name=\"f" + std::to_string(k) +
-                 "\" optype=\"continuous\" dataType=\"double\"><ParameterField name=\"v\"/>"
-                 "<Apply function=\"+\"><Apply function=\"" + previous +
-                 "\"><FieldRef field=\"v\"/></Apply><Apply function=\"" + previous +
-                 "\"><FieldRef field=\"v\"/></Apply></Apply></DefineFunction>";
-  }
+  const std::string functions = qztest::DoublingFunctions(levels);
   const Loaded loaded = LoadTransformations(TransformDocument(
       functions, "<Apply function=\"f" + std::to_string(levels) +
                      "\"><FieldRef field=\"x\"/></Apply>"));
